@@ -1,0 +1,28 @@
+// The whole public interface of liblodestack in one include.
+#ifndef LODESTACK_LODESTACK_H
+#define LODESTACK_LODESTACK_H
+
+// core
+#include "lodestack/core/Export.h"
+#include "lodestack/core/Status.h"
+
+// gom
+#include "lodestack/gom/CharacterData.h"
+#include "lodestack/gom/Collection.h"
+#include "lodestack/gom/GenericObject.h"
+#include "lodestack/gom/ObjectBase.h"
+#include "lodestack/gom/ReferenceCountable.h"
+#include "lodestack/gom/SharedPointer.h"
+#include "lodestack/gom/ValueCollection.h"
+#include "lodestack/gom/Variant.h"
+
+// stream
+#include "lodestack/stream/Buffer.h"
+#include "lodestack/stream/BufferStream.h"
+#include "lodestack/stream/ISerializable.h"
+#include "lodestack/stream/IStream.h"
+
+// schema
+#include "lodestack/schema/ObjectBaseFactory.h"
+
+#endif  // LODESTACK_LODESTACK_H

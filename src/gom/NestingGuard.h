@@ -1,0 +1,30 @@
+// Counts, per thread, how deeply the reader is inside nested objects, so
+// that hostile input cannot exhaust the stack.
+#ifndef LODESTACK_SRC_GOM_NESTINGGUARD_H
+#define LODESTACK_SRC_GOM_NESTINGGUARD_H
+
+#include "lodestack/gom/Variant.h"
+
+namespace lodestack {
+namespace gom {
+
+class NestingGuard {
+ public:
+  NestingGuard() { ++depth(); }
+  ~NestingGuard() { --depth(); }
+  NestingGuard(const NestingGuard&) = delete;
+  NestingGuard& operator=(const NestingGuard&) = delete;
+
+  bool ok() const { return depth() <= Variant::kMaxNestingDepth; }
+
+ private:
+  static int& depth() {
+    static thread_local int value = 0;
+    return value;
+  }
+};
+
+}  // namespace gom
+}  // namespace lodestack
+
+#endif  // LODESTACK_SRC_GOM_NESTINGGUARD_H

@@ -1,0 +1,21 @@
+#include "lodestack/schema/ObjectBaseFactory.h"
+
+#include "gom/RecordFactory.h"
+
+namespace lodestack {
+namespace schema {
+
+gom::SharedPointer<gom::ObjectBase> ObjectBaseFactory::createObject(unsigned short id) {
+  switch (id) {
+    default:
+      return gom::SharedPointer<gom::ObjectBase>();
+  }
+}
+
+namespace {
+// The object model reads code-14 variants through this factory.
+[[maybe_unused]] const bool registered = gom::installRecordFactory(&ObjectBaseFactory::createObject);
+}  // namespace
+
+}  // namespace schema
+}  // namespace lodestack
