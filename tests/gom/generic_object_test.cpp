@@ -1,0 +1,239 @@
+#include <vector>
+
+#include <gtest/gtest.h>
+
+#include "lodestack/gom/CharacterData.h"
+#include "lodestack/gom/GenericObject.h"
+#include "lodestack/gom/ObjectBase.h"
+#include "lodestack/gom/ValueCollection.h"
+#include "lodestack/stream/BufferStream.h"
+
+namespace lodestack {
+namespace gom {
+namespace {
+
+using Bytes = std::vector<unsigned char>;
+
+Bytes serialise(const GenericObject& object) {
+  BufferStream s;
+  EXPECT_TRUE(object.write(s));
+  return Bytes(s.buffer().data(), s.buffer().data() + s.buffer().size());
+}
+
+BufferStream streamOf(const Bytes& bytes) {
+  return BufferStream(bytes.data(), static_cast<unsigned int>(bytes.size()));
+}
+
+// A tree with every kind of value, nested objects and collections.
+SharedPointer<GenericObject> richObject() {
+  SharedPointer<GenericObject> o = GenericObject::create(1);
+  EXPECT_EQ(o->setInt8Property(1, -5), Ok);
+  EXPECT_EQ(o->setUint8Property(2, 250), Ok);
+  EXPECT_EQ(o->setInt16Property(3, -300), Ok);
+  EXPECT_EQ(o->setUint16Property(4, 60000), Ok);
+  EXPECT_EQ(o->setInt32Property(5, -70000), Ok);
+  EXPECT_EQ(o->setUint32Property(6, 4000000000u), Ok);
+  EXPECT_EQ(o->setInt64Property(7, -(1ll << 40)), Ok);
+  EXPECT_EQ(o->setUint64Property(8, 1ull << 63), Ok);
+  EXPECT_EQ(o->setFloatProperty(9, 1.5f), Ok);
+  EXPECT_EQ(o->setDoubleProperty(10, -2.25), Ok);
+  EXPECT_EQ(o->setBooleanProperty(11, true), Ok);
+  EXPECT_EQ(o->setStringProperty(12, CharacterData::create("hello", 5)), Ok);
+  SharedPointer<GenericObject> inner = GenericObject::create(2);
+  EXPECT_EQ(inner->setUint32Property(205, 1234), Ok);
+  EXPECT_EQ(o->setGenericObjectProperty(13, inner), Ok);
+  SharedPointer<ValueCollection> list = ValueCollection::create();
+  for (unsigned int i = 0; i < 3; ++i) {
+    Variant* item = Variant::create();
+    EXPECT_EQ(item->setGenericObjectValue(inner->clone()), Ok);
+    EXPECT_EQ(list->add(item), Ok);
+  }
+  EXPECT_EQ(o->setCollectionProperty(15, list), Ok);
+  return o;
+}
+
+TEST(GenericObject, SerialisesToTheDocumentedBytes) {
+  SharedPointer<GenericObject> o = GenericObject::create(200);
+  ASSERT_EQ(o->setUint8Property(10, 5), Ok);
+  ASSERT_EQ(o->setStringProperty(11, CharacterData::create("ab", 2)), Ok);
+  const Bytes expected = {0xC8, 0x00, 0x02, 0x00, 0x00, 0x00, 0x02, 0x00, 0x0A, 0x00, 0x05,
+                          0x0C, 0x00, 0x0B, 0x00, 0x02, 0x00, 0x00, 0x00, 0x61, 0x62};
+  EXPECT_EQ(serialise(*o), expected);
+
+  BufferStream in = streamOf(expected);
+  SharedPointer<GenericObject> back = GenericObject::create(in);
+  ASSERT_TRUE(back);
+  EXPECT_EQ(*back, *o);
+  EXPECT_EQ(serialise(*back), expected);
+}
+
+TEST(GenericObject, RoundTripsEveryKind) {
+  SharedPointer<GenericObject> o = richObject();
+  const Bytes bytes = serialise(*o);
+  BufferStream in = streamOf(bytes);
+  SharedPointer<GenericObject> back = GenericObject::create(in);
+  ASSERT_TRUE(back);
+  EXPECT_EQ(*back, *o);
+  EXPECT_EQ(serialise(*back), bytes);
+
+  SharedPointer<GenericObject> deep = o->clone();
+  SharedPointer<GenericObject> shallow = GenericObject::create(o);
+  ASSERT_TRUE(deep && shallow);
+  EXPECT_EQ(*deep, *o);
+  EXPECT_EQ(*shallow, *o);
+  SharedPointer<GenericObject> a, b, c;
+  ASSERT_EQ(o->getGenericObjectProperty(13, a), Ok);
+  ASSERT_EQ(shallow->getGenericObjectProperty(13, b), Ok);
+  ASSERT_EQ(deep->getGenericObjectProperty(13, c), Ok);
+  EXPECT_EQ(a, b) << "create(const GenericObject&) shares nested objects";
+  EXPECT_NE(a, c) << "clone() copies them";
+}
+
+TEST(GenericObject, ReadingIsAllOrNothing) {
+  const Bytes bytes = serialise(*richObject());
+  SharedPointer<GenericObject> target = GenericObject::create(77);
+  ASSERT_EQ(target->setUint8Property(1, 1), Ok);
+  const Bytes before = serialise(*target);
+  // Every cut short of the whole record fails and leaves the target as it was.
+  for (std::size_t cut = 0; cut < bytes.size(); ++cut) {
+    BufferStream in(bytes.data(), static_cast<unsigned int>(cut));
+    EXPECT_FALSE(target->read(in)) << "cut at " << cut;
+    ASSERT_EQ(serialise(*target), before) << "cut at " << cut;
+  }
+  BufferStream whole = streamOf(bytes);
+  EXPECT_TRUE(target->read(whole));
+  EXPECT_EQ(target->key(), 1);
+}
+
+TEST(GenericObject, KeyZeroStopsTheRead) {
+  SharedPointer<GenericObject> target = GenericObject::create(9);
+  ASSERT_EQ(target->setUint8Property(1, 1), Ok);
+  BufferStream only(Bytes{0, 0}.data(), 2);
+  EXPECT_TRUE(target->read(only));
+  EXPECT_EQ(target->key(), 9);
+  EXPECT_EQ(target->propertyCount(), 1u);
+
+  // A writer emits key 0 with its count; the reader leaves the count unread.
+  SharedPointer<GenericObject> zero = GenericObject::create(0);
+  ASSERT_EQ(zero->setUint8Property(1, 1), Ok);
+  BufferStream in = streamOf(serialise(*zero));
+  EXPECT_TRUE(target->read(in));
+  EXPECT_EQ(in.offset(), 2u);
+}
+
+TEST(GenericObject, PropertiesKeepKindAndOrder) {
+  SharedPointer<GenericObject> o = GenericObject::create(3);
+  ASSERT_EQ(o->setUint16Property(7, 1), Ok);
+  EXPECT_EQ(o->setUint32Property(7, 1), Refused);
+  unsigned int u32;
+  EXPECT_EQ(o->getUint32Property(7, u32), Refused);
+  EXPECT_EQ(o->getUint32Property(8, u32), NotFound);
+  Variant v(0);
+  ASSERT_EQ(v.setUint32Value(3), Ok);
+  EXPECT_EQ(o->setProperty(7, v), Refused);
+  EXPECT_EQ(o->getProperty(99, v), NotFound);
+
+  ASSERT_EQ(o->setUint8Property(8, 2), Ok);
+  ASSERT_EQ(o->setUint8Property(9, 3), Ok);
+  ASSERT_EQ(o->setUint16Property(7, 5), Ok);  // in place: order stays 7, 8, 9
+  ASSERT_TRUE(o->removeProperty(8));
+  EXPECT_FALSE(o->removeProperty(8));
+  std::vector<unsigned short> ids;
+  unsigned short id;
+  for (bool more = o->getFirstKey(id); more; more = o->getNextKey(id)) ids.push_back(id);
+  EXPECT_EQ(ids, (std::vector<unsigned short>{7, 9}));
+
+  // Same properties set in another order make another object.
+  SharedPointer<GenericObject> a = GenericObject::create(3), b = GenericObject::create(3);
+  ASSERT_EQ(a->setUint8Property(1, 1), Ok);
+  ASSERT_EQ(a->setUint8Property(2, 2), Ok);
+  ASSERT_EQ(b->setUint8Property(2, 2), Ok);
+  ASSERT_EQ(b->setUint8Property(1, 1), Ok);
+  EXPECT_NE(*a, *b);
+
+  SharedPointer<GenericObject> empty = GenericObject::create(4);
+  EXPECT_FALSE(empty->getFirstKey(id));
+  EXPECT_FALSE(empty->getNextKey(id));
+}
+
+TEST(GenericObject, RemovingTheCurrentPropertySkipsTheNext) {
+  SharedPointer<GenericObject> o = GenericObject::create(3);
+  for (unsigned short i = 1; i <= 4; ++i) ASSERT_EQ(o->setUint8Property(i, 0), Ok);
+  unsigned short id;
+  ASSERT_TRUE(o->getFirstKey(id));
+  ASSERT_TRUE(o->getNextKey(id));
+  ASSERT_EQ(id, 2);
+  ASSERT_TRUE(o->removeProperty(2));  // the cursor is deliberately not adjusted
+  ASSERT_TRUE(o->getNextKey(id));
+  EXPECT_EQ(id, 4);
+  EXPECT_FALSE(o->getNextKey(id));
+}
+
+TEST(GenericObject, DuplicateIdsReadAsTheyCome) {
+  // key 5, two properties both with id 1: uint8 7, then uint8 8.
+  const Bytes bytes = {5, 0, 2, 0, 0, 0, 2, 0, 1, 0, 7, 2, 0, 1, 0, 8};
+  BufferStream in = streamOf(bytes);
+  SharedPointer<GenericObject> o = GenericObject::create(in);
+  ASSERT_TRUE(o);
+  EXPECT_EQ(o->propertyCount(), 2u);
+  unsigned char v = 0;
+  ASSERT_EQ(o->getUint8Property(1, v), Ok);
+  EXPECT_EQ(v, 7) << "the first one is what lookups find";
+}
+
+TEST(GenericObject, HostileBytesFailFast) {
+  // 4 billion properties claimed in ten bytes.
+  const Bytes manyProperties = {1, 0, 0xFF, 0xFF, 0xFF, 0xFF, 2, 0, 1, 0};
+  BufferStream a = streamOf(manyProperties);
+  EXPECT_FALSE(GenericObject::create(a));
+
+  // A 4 GB string claimed.
+  const Bytes hugeString = {1, 0, 1, 0, 0, 0, 12, 0, 1, 0, 0xFF, 0xFF, 0xFF, 0xFE, 'a'};
+  BufferStream b = streamOf(hugeString);
+  EXPECT_FALSE(GenericObject::create(b));
+
+  // 4 billion collection items, and records of type 0 and of an unknown type.
+  const Bytes manyItems = {1, 0, 1, 0, 0, 0, 15, 0, 1, 0, 0xFF, 0xFF, 0xFF, 0xFF, 0, 0, 0, 0};
+  BufferStream c = streamOf(manyItems);
+  EXPECT_FALSE(GenericObject::create(c));
+  for (unsigned char typeId : {0, 99}) {
+    const Bytes record = {1, 0, 1, 0, 0, 0, 14, 0, 1, 0, typeId, 0, 1, 0};
+    BufferStream d = streamOf(record);
+    EXPECT_FALSE(GenericObject::create(d)) << "record type " << int(typeId);
+  }
+
+  // Codes 0 and above 15 carry nothing and read fine.
+  const Bytes odd = {1, 0, 2, 0, 0, 0, 0, 0, 1, 0, 99, 0, 2, 0};
+  BufferStream e = streamOf(odd);
+  SharedPointer<GenericObject> o = GenericObject::create(e);
+  ASSERT_TRUE(o);
+  EXPECT_EQ(o->propertyCount(), 2u);
+}
+
+Bytes nestedObjects(int depth) {
+  // depth objects, each holding the next as property 1 (code 13).
+  Bytes bytes;
+  for (int i = 0; i < depth; ++i) {
+    const Bytes head = {1, 0, 1, 0, 0, 0, 13, 0, 1, 0};
+    bytes.insert(bytes.end(), head.begin(), head.end());
+  }
+  const Bytes leaf = {1, 0, 0, 0, 0, 0};
+  bytes.insert(bytes.end(), leaf.begin(), leaf.end());
+  return bytes;
+}
+
+TEST(GenericObject, NestingIsBounded) {
+  const Bytes fine = nestedObjects(Variant::kMaxNestingDepth);
+  BufferStream a = streamOf(fine);
+  EXPECT_TRUE(GenericObject::create(a)) << "the documented depth is accepted";
+  const Bytes deep = nestedObjects(Variant::kMaxNestingDepth + 1);
+  BufferStream b = streamOf(deep);
+  EXPECT_FALSE(GenericObject::create(b));
+  const Bytes hostile = nestedObjects(100000);
+  BufferStream c = streamOf(hostile);
+  EXPECT_FALSE(GenericObject::create(c)) << "deep input fails instead of exhausting the stack";
+}
+
+}  // namespace
+}  // namespace gom
+}  // namespace lodestack
