@@ -11,6 +11,7 @@
 #include "lodestack/gom/Collection.h"
 #include "lodestack/gom/GenericObject.h"
 #include "lodestack/gom/ObjectBase.h"
+#include "lodestack/gom/ObjectCollection.h"
 #include "lodestack/gom/ReferenceCountable.h"
 #include "lodestack/gom/SharedPointer.h"
 #include "lodestack/gom/ValueCollection.h"
@@ -23,6 +24,12 @@
 #include "lodestack/stream/IStream.h"
 
 // schema
+#include "lodestack/schema/CellMeasurement.h"
+#include "lodestack/schema/GenericObjectWrapper.h"
+#include "lodestack/schema/InternalUtility.h"
+#include "lodestack/schema/MeasurementBase.h"
+#include "lodestack/schema/MeasurementContainer.h"
 #include "lodestack/schema/ObjectBaseFactory.h"
+#include "lodestack/schema/Record.h"
 
 #endif  // LODESTACK_LODESTACK_H

@@ -1,0 +1,70 @@
+#include <gtest/gtest.h>
+
+#include <lodestack/lodestack.h>
+
+using namespace lodestack;
+using namespace lodestack::schema;
+using gom::SharedPointer;
+
+TEST(GenericObjectWrapper, TypedAccessThrows) {
+  EXPECT_THROW(
+      {
+        try {
+          GenericObjectWrapper::create(SharedPointer<gom::GenericObject>());
+        } catch (Status s) {
+          EXPECT_EQ(WrongObjectType, s);
+          throw;
+        }
+      },
+      Status);
+
+  SharedPointer<GenericObjectWrapper> w = GenericObjectWrapper::create(9);
+  ASSERT_TRUE(w);
+  EXPECT_EQ(9, w->key());
+  int v = 0;
+  try {
+    w->getProperty(1, v, "v");
+    ADD_FAILURE() << "a missing property must throw";
+  } catch (Status s) {
+    EXPECT_EQ(NotFound, s);
+  }
+  w->setProperty(1, 42, "v");
+  w->getProperty(1, v, "v");
+  EXPECT_EQ(42, v);
+  unsigned char wrongKind = 0;
+  try {
+    w->getProperty(1, wrongKind, "v");
+    ADD_FAILURE() << "a kind mismatch must throw";
+  } catch (Status s) {
+    EXPECT_EQ(Refused, s);
+  }
+
+  // Shares the object; clone() is a deep copy of it.
+  SharedPointer<GenericObjectWrapper> shared = GenericObjectWrapper::create(w->wrappedObject());
+  EXPECT_EQ(w->wrappedObject().get(), shared->wrappedObject().get());
+  SharedPointer<gom::GenericObject> clone = w->clone();
+  EXPECT_NE(clone.get(), w->wrappedObject().get());
+  EXPECT_TRUE(*clone == w->object());
+}
+
+TEST(InternalUtility, CollectionOperations) {
+  SharedPointer<gom::GenericObject> o = gom::GenericObject::create(1);
+  SharedPointer<gom::ValueCollection> c;
+  bool created = false;
+  ASSERT_EQ(Ok, InternalUtility::getCollection(o, 300, c, created));
+  EXPECT_TRUE(created);
+  ASSERT_EQ(Ok, InternalUtility::getCollection(o, 300, c, created));
+  EXPECT_FALSE(created);
+
+  SharedPointer<gom::GenericObject> item = gom::GenericObject::create(2);
+  ASSERT_EQ(Ok, InternalUtility::addGenericObjectToCollection(o, 301, item));
+  SharedPointer<gom::ValueCollection> c301;
+  ASSERT_EQ(Ok, o->getCollectionProperty(301, c301));
+  SharedPointer<gom::GenericObject> back;
+  ASSERT_EQ(Ok, c301->item(0)->getGenericObjectValue(back));
+  EXPECT_EQ(item.get(), back.get()) << "shared, not copied";
+
+  ASSERT_EQ(Ok, o->setUint8Property(302, 1));
+  EXPECT_EQ(Refused, InternalUtility::addGenericObjectToCollection(o, 302, item));
+  EXPECT_EQ(Refused, InternalUtility::getCollection(o, 302, c, created));
+}

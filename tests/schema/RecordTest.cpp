@@ -1,0 +1,159 @@
+// The value-record conventions, on two small records made for the test.
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <vector>
+
+#include <lodestack/lodestack.h>
+
+using namespace lodestack;
+using namespace lodestack::schema;
+using gom::SharedPointer;
+
+namespace {
+
+class Inner : public Record<Inner, 7001,
+                            FieldTable<unsigned char, Field<unsigned char, 1>,
+                                       Field<unsigned short, 2>, Field<signed char, 8>,
+                                       Field<float, 16>>> {
+ public:
+  LODESTACK_RECORD_PROPERTY(0, a, setA)
+  LODESTACK_RECORD_PROPERTY(1, b, setB)
+  LODESTACK_RECORD_PROPERTY(2, c, setC)
+  LODESTACK_RECORD_PROPERTY(3, d, setD)
+};
+
+class Outer : public Record<Outer, 7002,
+                            FieldTable<unsigned char, Field<SharedPointer<Inner>, 1>,
+                                       Field<unsigned int, 4>>> {
+ public:
+  LODESTACK_RECORD_PROPERTY(0, inner, setInner)
+  LODESTACK_RECORD_PROPERTY(1, n, setN)
+};
+
+std::vector<unsigned char> bytesOf(const ISerializable& record) {
+  BufferStream out;
+  EXPECT_TRUE(record.write(out));
+  const Buffer& b = out.buffer();
+  return std::vector<unsigned char>(b.data(), b.data() + b.size());
+}
+
+bool readFrom(ISerializable& record, std::vector<unsigned char> bytes) {
+  BufferStream in(bytes.data(), static_cast<unsigned int>(bytes.size()));
+  return record.read(in);
+}
+
+}  // namespace
+
+TEST(Record, PresenceSettersAndEquality) {
+  SharedPointer<Inner> x = Inner::create();
+  SharedPointer<Inner> y = Inner::create();
+  EXPECT_TRUE(x->valueExists(0));
+  EXPECT_FALSE(x->valueExists(1));
+  EXPECT_EQ(Ok, x->setA(5));
+  EXPECT_EQ(Ok, x->setC(-3));
+  EXPECT_EQ(9, x->presenceMask());
+  EXPECT_TRUE(x->valueExists(1 | 8));
+  EXPECT_FALSE(x->valueExists(1 | 2));
+
+  // Absent values do not take part in equality, whatever they hold.
+  y->setA(5);
+  y->setC(-3);
+  y->setB(77);
+  y->unset(2);
+  EXPECT_EQ(77, y->b()) << "unset clears the bit only";
+  EXPECT_TRUE(*x == *y);
+  y->setB(77);
+  EXPECT_FALSE(*x == *y) << "a present value against an absent one";
+  x->setB(78);
+  EXPECT_FALSE(*x == *y);
+  x->setB(77);
+  EXPECT_TRUE(*x == *y);
+  EXPECT_TRUE(x->compare(y.get()));
+
+  // The ObjectBase part decides last.
+  y->extension();
+  EXPECT_FALSE(*x == *y);
+  y->deleteExtension();
+
+  // Record-valued fields: by content; an empty pointer is absent.
+  SharedPointer<Outer> o1 = Outer::create();
+  SharedPointer<Outer> o2 = Outer::create();
+  o1->setInner(x);
+  EXPECT_TRUE(o1->valueExists(1));
+  o2->setInner(Inner::create(x));
+  EXPECT_TRUE(*o1 == *o2);
+  o2->inner()->setD(1.5f);
+  EXPECT_FALSE(*o1 == *o2);
+  EXPECT_FALSE(x->valueExists(16)) << "the copy is deep";
+  o2->setInner(SharedPointer<Inner>());
+  EXPECT_FALSE(o2->valueExists(1));
+  EXPECT_FALSE(o1->compare(x.get())) << "records of another class";
+}
+
+TEST(Record, Bytes) {
+  SharedPointer<Inner> x = Inner::create();
+  x->setB(0x1234);
+  x->setC(-2);
+  x->setD(1.0f);
+  const std::vector<unsigned char> expected = {1, 2 | 8 | 16, 0x34, 0x12, 0xFE,
+                                               0x00, 0x00, 0x80, 0x3F};
+  EXPECT_EQ(expected, bytesOf(*x)) << "version, mask, present fields at their widths";
+
+  SharedPointer<Outer> outer = Outer::create();
+  outer->setInner(x);
+  outer->setN(0xA0B0C0D0u);
+  outer->extension()->setUint8Property(1, 1);  // not part of the bytes
+  std::vector<unsigned char> bytes = bytesOf(*outer);
+  EXPECT_EQ(2u + expected.size() + 4u, bytes.size());
+  SharedPointer<Outer> back = Outer::create();
+  ASSERT_TRUE(readFrom(*back, bytes));
+  outer->deleteExtension();
+  EXPECT_TRUE(*outer == *back);
+
+  // A NaN read back equals itself, so a record always equals its own copy.
+  x->setD(std::nanf(""));
+  SharedPointer<Inner> nan = Inner::create();
+  ASSERT_TRUE(readFrom(*nan, bytesOf(*x)));
+  EXPECT_TRUE(*nan == *x);
+
+  // Wrong version or short input: failure, record cleared.
+  bytes[0] = 2;
+  EXPECT_FALSE(readFrom(*back, bytes));
+  EXPECT_EQ(0, back->presenceMask());
+  bytes[0] = 1;
+  bytes.pop_back();
+  EXPECT_FALSE(readFrom(*back, bytes));
+  EXPECT_EQ(0, back->presenceMask());
+  EXPECT_FALSE(back->inner());
+}
+
+TEST(Record, CloneIsDeep) {
+  SharedPointer<Outer> outer = Outer::create();
+  outer->setInner(Inner::create());
+  outer->inner()->setA(1);
+  outer->extension()->setUint8Property(9, 9);
+  SharedPointer<Outer> copy = SharedPointer<Outer>::cast(outer->clone());
+  ASSERT_TRUE(copy);
+  EXPECT_TRUE(*copy == *outer);
+  EXPECT_NE(copy->inner().get(), outer->inner().get());
+  EXPECT_NE(copy->extensionReference().get(), outer->extensionReference().get());
+  EXPECT_FALSE(Outer::create(SharedPointer<Outer>()));
+}
+
+TEST(ObjectCollection, BytesAndEquality) {
+  SharedPointer<gom::ObjectCollection<Inner>> list = gom::ObjectCollection<Inner>::create();
+  for (unsigned char i = 0; i < 3; ++i) {
+    SharedPointer<Inner> item = Inner::create();
+    item->setA(i);
+    ASSERT_EQ(Ok, list->add(item));
+  }
+  std::vector<unsigned char> bytes = bytesOf(*list);
+  EXPECT_EQ(4u + 3u * 3u, bytes.size()) << "count, then each record without type id";
+  SharedPointer<gom::ObjectCollection<Inner>> back = gom::ObjectCollection<Inner>::create();
+  ASSERT_TRUE(readFrom(*back, bytes));
+  EXPECT_TRUE(*list == *back);
+  bytes[0] = 200;  // more items claimed than present
+  SharedPointer<gom::ObjectCollection<Inner>> shortList = gom::ObjectCollection<Inner>::create();
+  EXPECT_FALSE(readFrom(*shortList, bytes));
+}
