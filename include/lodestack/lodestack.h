@@ -31,5 +31,14 @@
 #include "lodestack/schema/MeasurementContainer.h"
 #include "lodestack/schema/ObjectBaseFactory.h"
 #include "lodestack/schema/Record.h"
+#include "lodestack/schema/utility/Utility.h"
+
+// math
+#include "lodestack/math/Midpoint.h"
+#include "lodestack/math/ShapeMatrix.h"
+#include "lodestack/math/StateEstimate.h"
+#include "lodestack/math/StateEstimateCovariance.h"
+#include "lodestack/math/Symmetric2by2Matrix.h"
+#include "lodestack/math/Symmetric4by4Matrix.h"
 
 #endif  // LODESTACK_LODESTACK_H
