@@ -31,6 +31,7 @@
 #include "lodestack/schema/MeasurementContainer.h"
 #include "lodestack/schema/ObjectBaseFactory.h"
 #include "lodestack/schema/Record.h"
+#include "lodestack/schema/Wlan.h"
 #include "lodestack/schema/utility/Utility.h"
 
 // math

@@ -1,12 +1,17 @@
 #include "lodestack/schema/ObjectBaseFactory.h"
 
 #include "gom/RecordFactory.h"
+#include "lodestack/schema/Wlan.h"
 
 namespace lodestack {
 namespace schema {
 
 gom::SharedPointer<gom::ObjectBase> ObjectBaseFactory::createObject(unsigned short id) {
   switch (id) {
+    case WlanDn::kTypeId:
+      return WlanDn::create();
+    case WlanApMeasurement::kTypeId:
+      return WlanApMeasurement::create();
     default:
       return gom::SharedPointer<gom::ObjectBase>();
   }

@@ -6,16 +6,20 @@
 //   ellipsoid at a given latitude.
 // - Great-circle distance and initial bearing on a spherical earth of radius
 //   6371010 m.
+// - The ranking of WLAN measurements by received level, and the trimming
+//   of a collection of them to its strongest entries.
 // - Distances and the overlap test between two uncertainty ellipses, each a
 //   centre (Midpoint) and a covariance in degrees^2 (ShapeMatrix); an
 //   ellipse is the set of points x with (x - m)^T S^-1 (x - m) <= 1.
 //
-// Angles are degrees unless stated. Every function is pure and may be called
-// from any thread.
+// Angles are degrees unless stated. Every function but trimWlanCollection is
+// pure and may be called from any thread; trimWlanCollection edits the
+// collection it is given, which belongs to one thread at a time.
 #ifndef LODESTACK_SCHEMA_UTILITY_UTILITY_H
 #define LODESTACK_SCHEMA_UTILITY_UTILITY_H
 
 #include "lodestack/core/Export.h"
+#include "lodestack/gom/ValueCollection.h"
 
 namespace lodestack {
 
@@ -67,6 +71,20 @@ class LODESTACK_EXPORT Utility {
   // points on one parallel half a turn apart give the way over the nearer
   // pole (0 on the northern hemisphere, 180 on the southern). Always true.
   static bool bearing(double lat1, double lon1, double lat2, double lon2, double& degrees);
+
+  // The ordering of trimWlanCollection: true when `a` ranks below `b`. Each
+  // variant holds a WlanMeasurement's generic object; its rank is the
+  // rxLevel of its wlanApMeasurement (signed). An entry without one (no
+  // access point measurement, no rxLevel, not a WLAN measurement at all)
+  // ranks below every entry that has one, and level with the others.
+  static bool sortWlans(gom::Variant* a, gom::Variant* b);
+  // Keeps the `limit` entries of highest rank, releasing the others; the
+  // survivors are left in ascending rank (ties in their former order). True
+  // when the collection holds `limit` entries or fewer (untouched) or was
+  // trimmed; false, with the collection untouched, for an empty pointer or
+  // when memory is exhausted.
+  static bool trimWlanCollection(unsigned int limit,
+                                 gom::SharedPointer<gom::ValueCollection> collection);
 
   // Whether the two ellipses share a point (touching counts). Covariances
   // must be positive semidefinite; when their sum is singular the ellipses
