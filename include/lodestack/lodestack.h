@@ -30,6 +30,7 @@
 #include "lodestack/schema/MeasurementBase.h"
 #include "lodestack/schema/MeasurementContainer.h"
 #include "lodestack/schema/ObjectBaseFactory.h"
+#include "lodestack/schema/PositionEstimate.h"
 #include "lodestack/schema/Record.h"
 #include "lodestack/schema/Wlan.h"
 #include "lodestack/schema/utility/Utility.h"

@@ -1,6 +1,7 @@
 #include "lodestack/schema/ObjectBaseFactory.h"
 
 #include "gom/RecordFactory.h"
+#include "lodestack/schema/PositionEstimate.h"
 #include "lodestack/schema/Wlan.h"
 
 namespace lodestack {
@@ -8,6 +9,8 @@ namespace schema {
 
 gom::SharedPointer<gom::ObjectBase> ObjectBaseFactory::createObject(unsigned short id) {
   switch (id) {
+    case PositionEstimate::kTypeId:
+      return PositionEstimate::create();
     case WlanDn::kTypeId:
       return WlanDn::create();
     case WlanApMeasurement::kTypeId:
