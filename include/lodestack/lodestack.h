@@ -24,7 +24,15 @@
 #include "lodestack/stream/IStream.h"
 
 // schema
+#include "lodestack/schema/Area.h"
+#include "lodestack/schema/Cdma.h"
+#include "lodestack/schema/CellDn.h"
 #include "lodestack/schema/CellMeasurement.h"
+#include "lodestack/schema/CellularObject.h"
+#include "lodestack/schema/CellularRecords.h"
+#include "lodestack/schema/Coverage.h"
+#include "lodestack/schema/EUtra.h"
+#include "lodestack/schema/Geran.h"
 #include "lodestack/schema/GenericObjectWrapper.h"
 #include "lodestack/schema/InternalUtility.h"
 #include "lodestack/schema/MeasurementBase.h"
@@ -32,6 +40,8 @@
 #include "lodestack/schema/ObjectBaseFactory.h"
 #include "lodestack/schema/PositionEstimate.h"
 #include "lodestack/schema/Record.h"
+#include "lodestack/schema/UtraFdd.h"
+#include "lodestack/schema/UtraTdd.h"
 #include "lodestack/schema/Wlan.h"
 #include "lodestack/schema/utility/Utility.h"
 

@@ -111,6 +111,17 @@ class LODESTACK_EXPORT CellMeasurement : public Traits::Base {
   CellMeasurement() = default;
 };
 
+// The traits of one technology's cell measurement in one line.
+template <class BaseT, class ServingCellMeasurementT, class NwMeasurementT,
+          unsigned short TypeId, bool UnreliableState>
+struct LODESTACK_EXPORT CellMeasurementTraits {
+  using Base = BaseT;
+  using ServingCellMeasurement = ServingCellMeasurementT;
+  using NwMeasurement = NwMeasurementT;
+  static constexpr unsigned short kTypeId = TypeId;
+  static constexpr bool kUnreliableState = UnreliableState;
+};
+
 }  // namespace schema
 }  // namespace lodestack
 

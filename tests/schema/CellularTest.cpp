@@ -1,0 +1,259 @@
+// The cellular families: factory ids, bytes of every record, and what the
+// families do differently (masks, widths, delegated properties, type checks).
+#include <gtest/gtest.h>
+
+#include <cstdlib>
+#include <fstream>
+#include <string>
+
+#include "schema/SampleRecords.h"
+
+using namespace lodestack;
+using namespace lodestack::schema;
+using gom::SharedPointer;
+
+namespace {
+
+std::vector<unsigned char> bytesOf(const ISerializable& s) {
+  BufferStream out;
+  EXPECT_TRUE(s.write(out));
+  const Buffer& b = out.buffer();
+  return std::vector<unsigned char>(b.data(), b.data() + b.size());
+}
+
+template <class R>
+std::vector<unsigned char> bytesAfterVersion(const SharedPointer<R>& r) {
+  std::vector<unsigned char> b = bytesOf(*r);
+  EXPECT_EQ(1, b.at(0)) << "version byte";
+  return std::vector<unsigned char>(b.begin() + 1, b.end());
+}
+
+// A generic object holding every record as a code-14 property.
+SharedPointer<gom::GenericObject> objectOfAllRecords() {
+  SharedPointer<gom::GenericObject> o = gom::GenericObject::create(500);
+  for (const SharedPointer<gom::ObjectBase>& r : sample::allRecords()) {
+    EXPECT_EQ(Ok, o->setObjectProperty(r->key(), r));
+  }
+  return o;
+}
+
+}  // namespace
+
+TEST(Cellular, FactoryIds) {
+  for (unsigned short id : {0, 99, 113, 128, 129, 130, 136}) {
+    EXPECT_FALSE(ObjectBaseFactory::createObject(id)) << id;
+  }
+  unsigned int known = 0;
+  for (const SharedPointer<gom::ObjectBase>& r : sample::allRecords()) {
+    SharedPointer<gom::ObjectBase> empty = ObjectBaseFactory::createObject(r->key());
+    ASSERT_TRUE(empty) << r->key();
+    EXPECT_EQ(r->key(), empty->key());
+    EXPECT_TRUE(typeid(*empty) == typeid(*r)) << r->key();
+    ++known;
+  }
+  EXPECT_EQ(32u, known);
+}
+
+TEST(Cellular, EveryRecordTravelsInsideAGenericObject) {
+  SharedPointer<gom::GenericObject> o = objectOfAllRecords();
+  std::vector<unsigned char> bytes = bytesOf(*o);
+  BufferStream in(bytes.data(), static_cast<unsigned int>(bytes.size()));
+  SharedPointer<gom::GenericObject> back = gom::GenericObject::create(in);
+  ASSERT_TRUE(back);
+  EXPECT_TRUE(*back == *o);
+  for (const SharedPointer<gom::ObjectBase>& r : sample::allRecords()) {
+    SharedPointer<gom::ObjectBase> read;
+    ASSERT_EQ(Ok, back->getObjectProperty(r->key(), read));
+    EXPECT_TRUE(read->compare(r.get())) << r->key();
+    SharedPointer<gom::ObjectBase> clone = r->clone();
+    EXPECT_TRUE(clone && clone->compare(r.get())) << r->key();
+  }
+  // Cut anywhere, the object does not read.
+  for (std::size_t n = 0; n < bytes.size(); n += 7) {
+    BufferStream cut(bytes.data(), static_cast<unsigned int>(n));
+    EXPECT_FALSE(gom::GenericObject::create(cut)) << n;
+  }
+}
+
+TEST(Cellular, FullContainerRoundTrip) {
+  SharedPointer<MeasurementContainer> c = sample::fullContainer();
+  EXPECT_TRUE(c->valueExists(0x7F));
+  std::vector<unsigned char> bytes = bytesOf(*c);
+  BufferStream in(bytes.data(), static_cast<unsigned int>(bytes.size()));
+  SharedPointer<MeasurementContainer> back =
+      MeasurementContainer::create(gom::GenericObject::create(in));
+  ASSERT_TRUE(back);
+  EXPECT_TRUE(*back == *c);
+  SharedPointer<UtraFddCellMeasurement> fdd =
+      UtraFddCellMeasurement::create(back->utraFddMeasurement(0));
+  ASSERT_TRUE(fdd);
+  EXPECT_EQ(1699999990u, fdd->unreliableStateTimeStamp());
+  EXPECT_EQ(3u, fdd->nwMeasurementCollection()->size());
+  EXPECT_TRUE(*fdd->dn() == *sample::full<UtraCellDn>());
+  EXPECT_FALSE(UtraFddCellMeasurement::create(back->utraTddMeasurement(0)))
+      << "the type id of the wrapped object is checked";
+}
+
+TEST(Cellular, MasksAndWidths) {
+  // GERAN: timing advance 8 bits; UTRA-TDD and E-UTRA: 16 bits.
+  SharedPointer<GeranServingCellMeasurement> geran = GeranServingCellMeasurement::create();
+  geran->setTimingAdvance(0x12);
+  EXPECT_EQ((std::vector<unsigned char>{2, 0x12}), bytesAfterVersion(geran));
+  SharedPointer<UtraTddServingCellMeasurement> tdd = UtraTddServingCellMeasurement::create();
+  tdd->setTimingAdvance(0x1234);
+  EXPECT_EQ((std::vector<unsigned char>{4, 0x34, 0x12}), bytesAfterVersion(tdd));
+  SharedPointer<EUtraServingCellMeasurement> eutra = EUtraServingCellMeasurement::create();
+  eutra->setTimingAdvance(0x1234);
+  EXPECT_EQ((std::vector<unsigned char>{2, 0x34, 0x12}), bytesAfterVersion(eutra));
+
+  // UTRA-FDD serving: nwMeasurement on bit 128; rscp is signed.
+  SharedPointer<UtraFddServingCellMeasurement> fdd = UtraFddServingCellMeasurement::create();
+  fdd->setLac(0x0102);
+  ASSERT_EQ(Ok, fdd->setUarfcnUl(0x0A0B));
+  fdd->nwMeasurement()->setRscp(-5);
+  EXPECT_EQ(0x81, fdd->presenceMask());
+  EXPECT_EQ((std::vector<unsigned char>{0x81, 0x02, 0x01, 1, 2 | 32, 0x0B, 0x0A, 0xFB}),
+            bytesAfterVersion(fdd));
+  EXPECT_EQ(-5, fdd->nwMeasurement()->rscp());
+
+  // UTRA ucid split and merge; the merge does not mask the RNC id.
+  SharedPointer<UtraCellDn> utra = UtraCellDn::create(244, 5, UtraCellDn::mergeUcid(300, 17));
+  EXPECT_EQ(300, utra->rncId());
+  EXPECT_EQ(17, utra->cid());
+  EXPECT_EQ(0x12340011u, UtraCellDn::mergeUcid(0x1234, 0x11));
+  unsigned short rnc = 0, cid = 0;
+  UtraCellDn::splitUcid(0x12340011u, rnc, cid);
+  EXPECT_EQ(0x234, rnc);
+  EXPECT_EQ(0x11, cid);
+  SharedPointer<EUtraCellDn> lte = EUtraCellDn::create(1, 2, 0x0FFFFFFF);
+  EXPECT_EQ(0xFFFFFu, lte->eNodeBId());
+  EXPECT_EQ(255, lte->lcid());
+  EXPECT_EQ(0x123456789u & 0xFFFFFFFFu, EUtraCellDn::mergeUcid(0x1234567, 0x89));
+
+  // CDMA frequency infos carry nothing and always compare equal.
+  EXPECT_EQ((std::vector<unsigned char>{0}), bytesAfterVersion(CdmaFrequencyInfo::create()));
+  EXPECT_TRUE(*CdmaFrequencyInfo::create() == *CdmaFrequencyInfo::create());
+}
+
+TEST(Cellular, DelegatedProperties) {
+  SharedPointer<GeranServingCellMeasurement> s = GeranServingCellMeasurement::create();
+  EXPECT_FALSE(s->valueExists(1));
+  EXPECT_EQ(0, s->rxLevel());
+  ASSERT_EQ(Ok, s->setRxLevel(40));
+  ASSERT_TRUE(s->nwMeasurement());
+  EXPECT_EQ(40, s->nwMeasurement()->rxLevel());
+  EXPECT_EQ(8, s->nwMeasurement()->presenceMask());
+  EXPECT_TRUE(s->valueExists(1 | 16));
+  EXPECT_EQ(16, s->presenceMask()) << "delegated bits are not the record's own";
+  EXPECT_FALSE(s->valueExists(4)) << "the network measurement lacks frequencyInfo";
+  ASSERT_EQ(Ok, s->setFrequencyInfo(GeranFrequencyInfo::create(3, 700)));
+  EXPECT_TRUE(s->valueExists(1 | 4 | 16));
+  EXPECT_EQ(700, s->frequencyInfo()->arfcn());
+  s->unset(1);
+  EXPECT_FALSE(s->nwMeasurement()->valueExists(8));
+
+  SharedPointer<GeranNwMeasurement> held = s->nwMeasurement();
+  EXPECT_EQ(Refused, s->setNwMeasurement(SharedPointer<GeranNwMeasurement>()));
+  EXPECT_EQ(held.get(), s->nwMeasurement().get()) << "an empty pointer changes nothing";
+
+  // Equality sees the delegated values through the network measurement.
+  SharedPointer<GeranServingCellMeasurement> copy = GeranServingCellMeasurement::create(s);
+  EXPECT_TRUE(*copy == *s);
+  copy->setFrequencyInfo(GeranFrequencyInfo::create(3, 701));
+  EXPECT_FALSE(*copy == *s);
+
+  // The other families delegate frequencyInfo on their own bits.
+  SharedPointer<CdmaServingCellMeasurement> cdma = CdmaServingCellMeasurement::create();
+  cdma->setFrequencyInfo(CdmaFrequencyInfo::create());
+  EXPECT_EQ(2, cdma->presenceMask());
+  EXPECT_TRUE(cdma->valueExists(1 | 2));
+  SharedPointer<EUtraServingCellMeasurement> eutra = EUtraServingCellMeasurement::create();
+  eutra->setFrequencyInfo(EUtraFrequencyInfo::create(6300, 12));
+  EXPECT_EQ(1, eutra->presenceMask());
+  EXPECT_TRUE(eutra->valueExists(1 | 4));
+  SharedPointer<UtraTddServingCellMeasurement> tdd = UtraTddServingCellMeasurement::create();
+  tdd->setFrequencyInfo(UtraTddFrequencyInfo::create(10055, 7));
+  EXPECT_EQ(8, tdd->presenceMask());
+  EXPECT_TRUE(tdd->valueExists(2 | 8));
+}
+
+TEST(Cellular, CellMeasurementsAcceptTheirOwnNetworkMeasurements) {
+  const std::vector<SharedPointer<gom::ObjectBase>> nw = {
+      GeranNwMeasurement::create(), UtraFddNwMeasurement::create(),
+      UtraTddNwMeasurement::create(), EUtraNwMeasurement::create(),
+      CdmaNwMeasurement::create()};
+  auto flags = [&nw](auto m, std::size_t own, unsigned short typeId) {
+    EXPECT_EQ(typeId, m->key());
+    for (std::size_t i = 0; i < nw.size(); ++i) {
+      EXPECT_EQ(i == own ? Ok : Refused, m->addNwMeasurement(nw[i]))
+          << "type " << typeId << " given record " << nw[i]->key();
+    }
+    EXPECT_EQ(1u, m->nwMeasurementCollection()->size());
+    return m->kAllFlags;
+  };
+  EXPECT_EQ(0xFu, flags(GeranCellMeasurement::create(), 0, 2));
+  EXPECT_EQ(0x1Fu, flags(UtraFddCellMeasurement::create(), 1, 3));
+  EXPECT_EQ(0x1Fu, flags(UtraTddCellMeasurement::create(), 2, 4));
+  EXPECT_EQ(0xFu, flags(EUtraCellMeasurement::create(), 3, 14));
+  EXPECT_EQ(0xFu, flags(CdmaCellMeasurement::create(), 4, 17));
+
+  SharedPointer<UtraFddCellMeasurement> fdd = UtraFddCellMeasurement::create();
+  fdd->setUnreliableStateTimeStamp(9);
+  EXPECT_TRUE(fdd->valueExists(16));
+  SharedPointer<GeranCellMeasurement> geran = GeranCellMeasurement::create();
+  geran->wrappedObject()->setUint32Property(207, 9);
+  EXPECT_FALSE(geran->valueExists(16)) << "GERAN has no flag 0x10 whatever it holds";
+}
+
+TEST(Cellular, CellsAndNeighbours) {
+  SharedPointer<GeranCell> cell = sample::full<GeranCell>();
+  EXPECT_EQ(2u, cell->currentNeighbors().size());
+  SharedPointer<GeranCell> copy = GeranCell::create(cell);
+  EXPECT_TRUE(*copy == *cell);
+  EXPECT_NE(copy->neighbors()[0].get(), cell->neighbors()[0].get()) << "deep copy";
+  copy->neighbors()[1]->setLac(1);
+  EXPECT_FALSE(*copy == *cell);
+  copy->neighbors().removeAt(1);
+  EXPECT_FALSE(*copy == *cell);
+
+  // A neighbour: coverage and frequencyInfo by content.
+  SharedPointer<GeranNeighborCell> a = GeranNeighborCell::create(GeranFrequencyInfo::create(1, 2));
+  SharedPointer<GeranNeighborCell> b = GeranNeighborCell::create(GeranFrequencyInfo::create(1, 2));
+  EXPECT_TRUE(*a == *b);
+  a->setCoverage(Area::create(1, 2, 30, 20, 45.0f));
+  EXPECT_FALSE(*a == *b);
+  b->setCoverage(Area::create(1, 2, 30, 20, 45.0f));
+  EXPECT_TRUE(*a == *b);
+
+  // The neighbour list travels after the cell's own fields.
+  std::vector<unsigned char> bytes = bytesOf(*cell);
+  SharedPointer<GeranCell> back = GeranCell::create();
+  BufferStream in(bytes.data(), static_cast<unsigned int>(bytes.size()));
+  ASSERT_TRUE(back->read(in));
+  EXPECT_TRUE(*back == *cell);
+  BufferStream cut(bytes.data(), static_cast<unsigned int>(bytes.size() - 1));
+  EXPECT_FALSE(back->read(cut));
+  EXPECT_EQ(0, back->presenceMask());
+  EXPECT_TRUE(back->currentNeighbors().empty()) << "a failed read leaves the cell cleared";
+}
+
+// With LODESTACK_WRITE_FUZZ_SEEDS=<dir>, writes the object-reader seeds:
+// every record in a code-14 variant, all of them in one generic object, and
+// a full container. The first byte selects the reader (0 object, 1 variant).
+TEST(Cellular, WriteFuzzSeeds) {
+  const char* dir = std::getenv("LODESTACK_WRITE_FUZZ_SEEDS");
+  if (!dir) GTEST_SKIP() << "set LODESTACK_WRITE_FUZZ_SEEDS to write the seeds";
+  auto save = [dir](const std::string& name, unsigned char selector, const ISerializable& s) {
+    std::vector<unsigned char> bytes = bytesOf(s);
+    std::ofstream out(std::string(dir) + "/" + name, std::ios::binary);
+    out.put(static_cast<char>(selector));
+    out.write(reinterpret_cast<const char*>(bytes.data()), static_cast<std::streamsize>(bytes.size()));
+  };
+  for (const SharedPointer<gom::ObjectBase>& r : sample::allRecords()) {
+    gom::Variant v(7);
+    ASSERT_EQ(Ok, v.setObjectValue(r));
+    save("record_" + std::to_string(r->key()), 1, v);
+  }
+  save("all_records", 0, *objectOfAllRecords());
+  save("measurement_container", 0, *sample::fullContainer());
+}
