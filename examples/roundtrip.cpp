@@ -46,7 +46,7 @@ void printVariant(const Variant& v, int indent) {
 
 void print(const GenericObject& object, int indent) {
   std::printf("%*sobject key %u, %u properties\n", indent, "", object.key(), object.propertyCount());
-  for (const InternalVariant& p : *object.properties()) printVariant(p, indent + 2);
+  for (const InternalVariant& p : object.properties()) printVariant(p, indent + 2);
 }
 
 SharedPointer<GenericObject> makeCell(unsigned int cellId, short rxLevel) {

@@ -18,8 +18,7 @@ bool hasKeyZero(const Variant& v);
 // (the reader stops after the key), so trees holding one skip the round trip.
 bool hasKeyZero(const GenericObject& object) {
   if (object.key() == 0) return true;
-  if (!object.properties()) return false;
-  for (const InternalVariant& p : *object.properties())
+  for (const InternalVariant& p : object.properties())
     if (hasKeyZero(p)) return true;
   return false;
 }

@@ -11,12 +11,24 @@ namespace gom {
 
 CharacterData::CharacterData() : data_(nullptr), length_(0) {}
 
-CharacterData::~CharacterData() { delete[] data_; }
+CharacterData::~CharacterData() { release(); }
+
+// Room for `bytes` bytes: the inline array when it is free and large
+// enough, else the heap; null on exhaustion.
+char* CharacterData::allocate(unsigned int bytes) {
+  if (bytes <= kInlineCapacity && data_ != inline_) return inline_;
+  return new (std::nothrow) char[bytes];
+}
+
+void CharacterData::release() {
+  if (data_ != inline_) delete[] data_;
+  data_ = nullptr;
+}
 
 SharedPointer<CharacterData> CharacterData::create(const char* text, unsigned int length) {
   SharedPointer<CharacterData> string(new (std::nothrow) CharacterData());
   if (!string || length == UINT_MAX) return SharedPointer<CharacterData>();
-  char* bytes = new (std::nothrow) char[length + 1];
+  char* bytes = string->allocate(length + 1);
   if (!bytes) return SharedPointer<CharacterData>();
   if (length) std::memcpy(bytes, text, length);
   bytes[length] = '\0';
@@ -44,6 +56,13 @@ bool CharacterData::operator==(const CharacterData& other) const {
 
 bool CharacterData::write(IStream& stream) const {
   const unsigned int length = data_ ? length_ : 0;
+  if (length <= kInlineCapacity) {
+    // Length and a short text leave in one write.
+    unsigned char record[4 + kInlineCapacity];
+    std::memcpy(record, &length, 4);
+    if (length) std::memcpy(record + 4, data_, length);
+    return stream.write(record, 4 + length) == 4 + length && stream.good();
+  }
   if (!stream.writeUint32(length)) return false;
   if (length && stream.write(reinterpret_cast<const unsigned char*>(data_), length) != length)
     return false;
@@ -60,10 +79,10 @@ bool CharacterData::read(IStream& stream) {
     const unsigned int left = stream.bytesLeftHint();
     if (length == UINT_MAX || (left != UINT_MAX && length > left)) return false;
     if (left != UINT_MAX) {
-      bytes = new (std::nothrow) char[length + 1];
+      bytes = allocate(length + 1);
       if (!bytes) return false;
       if (stream.read(reinterpret_cast<unsigned char*>(bytes), length) != length) {
-        delete[] bytes;
+        if (bytes != inline_) delete[] bytes;
         return false;
       }
     } else {
@@ -94,7 +113,7 @@ bool CharacterData::read(IStream& stream) {
     }
     bytes[length] = '\0';
   }
-  delete[] data_;
+  release();
   data_ = bytes;
   length_ = length;
   return stream.good();

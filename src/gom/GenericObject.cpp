@@ -1,5 +1,7 @@
+#include "gom/NodePool.h"
 #include "lodestack/gom/GenericObject.h"
 
+#include <cstring>
 #include <new>
 
 #include "lodestack/gom/CharacterData.h"
@@ -10,6 +12,53 @@
 namespace lodestack {
 namespace gom {
 
+namespace {
+const unsigned int kSmallCount = 64;
+using Pool = NodePool<sizeof(GenericObject)>;
+}  // namespace
+
+// Property arrays are sized by the count read or by growth from one
+// element: exact multiples of a property up to eight come from two pools.
+namespace {
+using SmallArrays = NodePool<4 * sizeof(InternalVariant)>;
+using MediumArrays = NodePool<8 * sizeof(InternalVariant)>;
+}  // namespace
+
+void* GenericObject::allocateBlock(std::size_t bytes) {
+  void* block = nullptr;
+  if (bytes <= 4 * sizeof(InternalVariant))
+    block = SmallArrays::allocate(4 * sizeof(InternalVariant));
+  else if (bytes <= 8 * sizeof(InternalVariant))
+    block = MediumArrays::allocate(8 * sizeof(InternalVariant));
+  else
+    block = ::operator new(bytes, std::nothrow);
+  if (!block) throw std::bad_alloc();
+  return block;
+}
+
+void GenericObject::releaseBlock(void* block, std::size_t bytes) noexcept {
+  if (bytes <= 4 * sizeof(InternalVariant))
+    SmallArrays::release(block, 4 * sizeof(InternalVariant));
+  else if (bytes <= 8 * sizeof(InternalVariant))
+    MediumArrays::release(block, 8 * sizeof(InternalVariant));
+  else
+    ::operator delete(block);
+}
+
+void* GenericObject::operator new(std::size_t size) {
+  void* block = Pool::allocate(size);
+  if (!block) throw std::bad_alloc();
+  return block;
+}
+
+void* GenericObject::operator new(std::size_t size, const std::nothrow_t&) noexcept {
+  return Pool::allocate(size);
+}
+
+void GenericObject::operator delete(void* block, std::size_t size) noexcept {
+  Pool::release(block, size);
+}
+
 GenericObject::GenericObject() : key_(0), cursor_(kNoCursor) {}
 
 GenericObject::GenericObject(unsigned short key) : key_(key), cursor_(kNoCursor) {}
@@ -17,20 +66,16 @@ GenericObject::GenericObject(unsigned short key) : key_(key), cursor_(kNoCursor)
 GenericObject::~GenericObject() = default;
 
 SharedPointer<GenericObject> GenericObject::create(unsigned short key) {
-  SharedPointer<GenericObject> object(new (std::nothrow) GenericObject(key));
-  if (!object) return object;
-  object->properties_ = PropertyStore::create();
-  if (!object->properties_) return SharedPointer<GenericObject>();
-  return object;
+  return SharedPointer<GenericObject>(new (std::nothrow) GenericObject(key));
 }
 
 SharedPointer<GenericObject> GenericObject::create(const GenericObject& source) {
   SharedPointer<GenericObject> copy = create(source.key_);
-  if (!copy || !source.properties_) return copy;
-  if (!copy->properties_->reserve(source.properties_->size()))
+  if (!copy) return copy;
+  try {
+    copy->properties_ = source.properties_;
+  } catch (const std::bad_alloc&) {
     return SharedPointer<GenericObject>();
-  for (const InternalVariant& property : *source.properties_) {
-    if (copy->properties_->add(property) != Ok) return SharedPointer<GenericObject>();
   }
   return copy;
 }
@@ -48,30 +93,33 @@ SharedPointer<GenericObject> GenericObject::create(IStream& stream) {
 
 SharedPointer<GenericObject> GenericObject::clone() const {
   SharedPointer<GenericObject> copy = create(key_);
-  if (!copy || !properties_) return copy;
-  if (!copy->properties_->reserve(properties_->size())) return SharedPointer<GenericObject>();
-  for (const InternalVariant& property : *properties_) {
+  if (!copy) return copy;
+  for (const InternalVariant& property : properties_) {
     InternalVariant deep(property.key());
-    if (deep.cloneFrom(property) != Ok || copy->properties_->add(std::move(deep)) != Ok)
+    if (deep.cloneFrom(property) != Ok || !append(copy->properties_, std::move(deep)))
       return SharedPointer<GenericObject>();
   }
   return copy;
 }
 
 InternalVariant* GenericObject::findPropertyImpl(unsigned short id) const {
-  if (!properties_) return nullptr;
-  for (InternalVariant& property : *properties_) {
-    if (property.key() == id) return &property;
+  for (const InternalVariant& property : properties_) {
+    if (property.key() == id) return const_cast<InternalVariant*>(&property);
   }
   return nullptr;
 }
 
-Status GenericObject::appendProperty(InternalVariant&& v) {
-  if (!properties_) {
-    properties_ = PropertyStore::create();
-    if (!properties_) return OutOfMemory;
+bool GenericObject::append(PropertyStore& store, InternalVariant&& v) {
+  try {
+    store.push_back(std::move(v));
+  } catch (const std::bad_alloc&) {
+    return false;
   }
-  return properties_->add(std::move(v));
+  return true;
+}
+
+Status GenericObject::appendProperty(InternalVariant&& v) {
+  return append(properties_, std::move(v)) ? Ok : OutOfMemory;
 }
 
 template <class T, Status (Variant::*Get)(T&) const>
@@ -144,14 +192,14 @@ Status GenericObject::setProperty(unsigned short id, const Variant& v) {
 bool GenericObject::removeProperty(unsigned short id) {
   InternalVariant* property = findPropertyImpl(id);
   if (!property) return false;
-  InternalVariant* next = nullptr;
-  return properties_->remove(property, next) == Ok;
+  properties_.erase(properties_.begin() + (property - properties_.data()));
+  return true;
 }
 
 bool GenericObject::getFirstKey(unsigned short& id) {
   if (propertyCount() == 0) return false;
   cursor_ = 0;
-  id = (*properties_)[0].key();
+  id = properties_[0].key();
   return true;
 }
 
@@ -162,7 +210,7 @@ bool GenericObject::getNextKey(unsigned short& id) {
     cursor_ = kNoCursor;
     return false;
   }
-  id = (*properties_)[static_cast<unsigned int>(cursor_)].key();
+  id = properties_[cursor_].key();
   return true;
 }
 
@@ -171,32 +219,32 @@ bool GenericObject::operator==(const GenericObject& other) const {
   const unsigned int count = propertyCount();
   if (count != other.propertyCount()) return false;
   for (unsigned int i = 0; i < count; ++i) {
-    if (!((*properties_)[i] == (*other.properties_)[i])) return false;
+    if (!(properties_[i] == other.properties_[i])) return false;
   }
   return true;
 }
 
 void GenericObject::dump() const {
-  if (!properties_) return;
-  for (const InternalVariant& property : *properties_) property.dump();
+  for (const InternalVariant& property : properties_) property.dump();
 }
 
 bool GenericObject::write(IStream& stream) const {
-  if (!stream.writeUint16(key_) || !stream.writeUint32(propertyCount())) return false;
-  if (properties_) {
-    for (const InternalVariant& property : *properties_) {
-      if (!property.write(stream)) return false;
-    }
+  unsigned char header[6];
+  const unsigned int count = propertyCount();
+  std::memcpy(header, &key_, 2);
+  std::memcpy(header + 2, &count, 4);
+  if (stream.write(header, 6) != 6) return false;
+  return writeProperties(stream);
+}
+
+bool GenericObject::writeProperties(IStream& stream) const {
+  for (const InternalVariant& property : properties_) {
+    if (!property.write(stream)) return false;
   }
   return stream.good();
 }
 
 bool GenericObject::read(IStream& stream) {
-  // An empty store that nobody else holds can take the properties directly:
-  // on failure it is emptied again, which leaves the object as it was.
-  const bool reuse = properties_ && properties_->empty() && properties_->referenceCount() == 1;
-  SharedPointer<PropertyStore> fresh = reuse ? properties_ : PropertyStore::create();
-  if (!fresh) return false;
   unsigned short key = 0;
   if (!stream.readUint16(key)) return false;
   // Key 0 ends the read here, leaving the count and properties that a
@@ -204,22 +252,27 @@ bool GenericObject::read(IStream& stream) {
   if (key == 0) return stream.good();
   unsigned int count = 0;
   if (!stream.readUint32(count)) return false;
-  // Every property takes at least 4 bytes: reserve no more than the stream
-  // can hold, so a forged count costs nothing before its bytes are there.
-  const unsigned int left = stream.bytesLeftHint();
-  const unsigned int plausible = left / 4 < count ? left / 4 : count;
-  if (plausible <= 4096) fresh->reserve(plausible);
+  // The properties go to a fresh store that replaces the old one only when
+  // everything was read. Every property takes at least 4 bytes: beyond a
+  // small count, reserve no more than the stream can hold, so a forged count
+  // costs nothing before its bytes are there.
+  PropertyStore fresh;
+  unsigned int plausible = count;
+  if (count > kSmallCount) {
+    const unsigned int left = stream.bytesLeftHint();
+    plausible = left / 4 < count ? left / 4 : count;
+  }
+  try {
+    fresh.reserve(plausible < 4096 ? plausible : 4096);
+  } catch (const std::bad_alloc&) {
+    return false;
+  }
   for (unsigned int i = 0; i < count; ++i) {
     InternalVariant property(0);
-    if (!property.read(stream) || fresh->add(std::move(property)) != Ok) {
-      if (reuse) {
-        while (!fresh->empty()) fresh->removeAt(fresh->size() - 1);
-      }
-      return false;
-    }
+    if (!property.read(stream) || !append(fresh, std::move(property))) return false;
   }
   key_ = key;
-  properties_ = fresh;
+  properties_.swap(fresh);
   cursor_ = kNoCursor;
   return stream.good();
 }

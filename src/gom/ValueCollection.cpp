@@ -63,8 +63,11 @@ bool ValueCollection::read(IStream& stream) {
   unsigned int count = 0;
   if (!stream.readUint32(count)) return false;
   // Each item takes at least 4 bytes, which bounds what is worth reserving.
-  const unsigned int left = stream.bytesLeftHint();
-  const unsigned int plausible = left / 4 < count ? left / 4 : count;
+  unsigned int plausible = count;
+  if (count > 64) {
+    const unsigned int left = stream.bytesLeftHint();
+    plausible = left / 4 < count ? left / 4 : count;
+  }
   if (plausible <= (1u << 20)) reserve(size() + plausible);
   for (unsigned int i = 0; i < count; ++i) {
     Variant* item = Variant::create();

@@ -80,28 +80,11 @@ void Buffer::reserve(unsigned int n) {
   grow(n);
 }
 
-void Buffer::append(const unsigned char* src, unsigned int n) {
-  if (n == 0) return;
-  unsigned char* dst = grow(n);
-  std::memcpy(dst, src, n);
-  size_ += n;
-}
-
 void Buffer::fill(unsigned char value, unsigned int n) {
   if (n == 0) return;
   unsigned char* dst = grow(n);
   std::memset(dst, value, n);
   size_ += n;
-}
-
-unsigned int Buffer::read(unsigned char* dst, unsigned int n, bool rewind) {
-  if (rewind) readPos_ = 0;
-  const unsigned int left = leftForReading();
-  const unsigned int m = n < left ? n : left;
-  if (m == 0) return 0;
-  std::memcpy(dst, data_ + readPos_, m);
-  readPos_ += m;
-  return m;
 }
 
 Status Buffer::setReadPosition(unsigned int pos) {

@@ -7,7 +7,6 @@
 namespace lodestack {
 
 IStream::~IStream() = default;
-ISerializable::~ISerializable() = default;
 
 unsigned int IStream::bytesLeftHint() {
   unsigned int size = 0;

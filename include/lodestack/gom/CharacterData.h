@@ -42,8 +42,14 @@ class LODESTACK_EXPORT CharacterData : public ReferenceCountable,
   ~CharacterData() override;
 
  private:
+  // Short strings (BSSIDs, names) live in the object itself.
+  static const unsigned int kInlineCapacity = 16;
+  char* allocate(unsigned int bytes);
+  void release();
+
   char* data_;
   unsigned int length_;
+  char inline_[kInlineCapacity];
 };
 
 }  // namespace gom

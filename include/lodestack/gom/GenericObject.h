@@ -20,6 +20,8 @@
 #define LODESTACK_GOM_GENERICOBJECT_H
 
 #include <cstddef>
+#include <new>
+#include <vector>
 
 #include "lodestack/gom/Collection.h"
 #include "lodestack/gom/Variant.h"
@@ -30,7 +32,28 @@ namespace gom {
 class LODESTACK_EXPORT GenericObject : public ReferenceCountable,
                                        public ISerializable {
  public:
-  using PropertyStore = Collection<InternalVariant>;
+  // Property arrays of the usual small sizes come from a per-thread cache of
+  // blocks; larger ones from the general allocator.
+  template <class T>
+  struct PropertyAllocator {
+    using value_type = T;
+    PropertyAllocator() = default;
+    template <class U>
+    PropertyAllocator(const PropertyAllocator<U>&) {}
+    T* allocate(std::size_t n) {
+      return static_cast<T*>(allocateBlock(n * sizeof(T)));
+    }
+    void deallocate(T* p, std::size_t n) { releaseBlock(p, n * sizeof(T)); }
+    bool operator==(const PropertyAllocator&) const { return true; }
+    bool operator!=(const PropertyAllocator&) const { return false; }
+  };
+  using PropertyStore = std::vector<InternalVariant, PropertyAllocator<InternalVariant>>;
+
+  // Nodes come from a per-thread cache of blocks; see the source.
+  static void* operator new(std::size_t size);
+  static void* operator new(std::size_t size, const std::nothrow_t&) noexcept;
+  static void* operator new(std::size_t, void* place) noexcept { return place; }
+  static void operator delete(void* block, std::size_t size) noexcept;
 
   static SharedPointer<GenericObject> create(unsigned short key);
   // Same key and the same properties, in order; nested strings, objects and
@@ -89,9 +112,9 @@ class LODESTACK_EXPORT GenericObject : public ReferenceCountable,
   InternalVariant* findProperty(unsigned short id) { return findPropertyImpl(id); }
   const InternalVariant* findProperty(unsigned short id) const { return findPropertyImpl(id); }
   bool propertyExists(unsigned short id) const { return findPropertyImpl(id) != nullptr; }
-  unsigned int propertyCount() const { return properties_ ? properties_->size() : 0; }
-  // The properties in order, or null for an object made without create().
-  const PropertyStore* properties() const { return properties_.get(); }
+  unsigned int propertyCount() const { return static_cast<unsigned int>(properties_.size()); }
+  // The properties in order. Valid until a property is added or removed.
+  const PropertyStore& properties() const { return properties_; }
 
   // Erases the property; those behind it move up one place. The iteration
   // cursor is deliberately left where it stands, so an iteration that
@@ -117,17 +140,26 @@ class LODESTACK_EXPORT GenericObject : public ReferenceCountable,
   ~GenericObject() override;
 
  private:
+  friend class Variant;  // writes a nested object's header with its own
+  bool writeProperties(IStream& stream) const;
   InternalVariant* findPropertyImpl(unsigned short id) const;
   template <class T, Status (Variant::*Get)(T&) const>
   Status getTyped(unsigned short id, T& v) const;
   template <class T, Status (Variant::*Set)(T)>
   Status setTyped(unsigned short id, T v);
   Status appendProperty(InternalVariant&& v);
+  static bool append(PropertyStore& store, InternalVariant&& v);
+
+  // Throws std::bad_alloc on exhaustion, as std::vector expects.
+  static void* allocateBlock(std::size_t bytes);
+  static void releaseBlock(void* block, std::size_t bytes) noexcept;
 
   static const std::size_t kNoCursor = static_cast<std::size_t>(-1);
 
   unsigned short key_;
-  SharedPointer<PropertyStore> properties_;
+  // Held directly rather than behind its own handle: nothing ever shares a
+  // property store, and it saves an allocation per object.
+  PropertyStore properties_;
   std::size_t cursor_;
 };
 

@@ -13,6 +13,9 @@
 #ifndef LODESTACK_GOM_VARIANT_H
 #define LODESTACK_GOM_VARIANT_H
 
+#include <cstddef>
+#include <new>
+
 #include "lodestack/core/Status.h"
 #include "lodestack/gom/SharedPointer.h"
 #include "lodestack/stream/ISerializable.h"
@@ -51,11 +54,24 @@ class LODESTACK_EXPORT Variant : public ISerializable {
   explicit Variant(unsigned short key) : key_(key), type_(TypeEmpty), bits_(0) {}
   // A copy of v (sharing its object) under another key.
   Variant(unsigned short key, const Variant& v);
-  Variant(const Variant& v);
-  Variant(Variant&& v) noexcept;
+  Variant(const Variant& v)
+      : ISerializable(), key_(v.key_), type_(v.type_), bits_(v.bits_) {
+    if (holdsObject() && object_) object_->increment();
+  }
+  Variant(Variant&& v) noexcept
+      : ISerializable(), key_(v.key_), type_(v.type_), bits_(v.bits_) {
+    v.type_ = TypeEmpty;
+    v.bits_ = 0;
+  }
   Variant& operator=(const Variant& v);
   Variant& operator=(Variant&& v) noexcept;
-  ~Variant() override;
+  ~Variant() override { releaseObject(); }
+
+  // Nodes come from a per-thread cache of blocks; see the source.
+  static void* operator new(std::size_t size);
+  static void* operator new(std::size_t size, const std::nothrow_t&) noexcept;
+  static void* operator new(std::size_t, void* place) noexcept { return place; }
+  static void operator delete(void* block, std::size_t size) noexcept;
 
   // A heap variant owned by the caller; null when memory is exhausted.
   static Variant* create();
@@ -115,7 +131,13 @@ class LODESTACK_EXPORT Variant : public ISerializable {
 
  protected:
   bool holdsObject() const { return type_ >= TypeString && type_ <= TypeCollection; }
-  void releaseObject();
+  void releaseObject() {
+    if (holdsObject() && object_) {
+      ReferenceCountable* old = object_;
+      bits_ = 0;
+      old->decrement();
+    }
+  }
   template <class T>
   Status setScalar(unsigned short code, T v);
   template <class T>
@@ -134,7 +156,7 @@ class LODESTACK_EXPORT Variant : public ISerializable {
 
 // The variant as stored inside a GenericObject: a Variant whose key is the
 // property id.
-class LODESTACK_EXPORT InternalVariant : public Variant {
+class LODESTACK_EXPORT InternalVariant final : public Variant {
  public:
   explicit InternalVariant(unsigned short key) : Variant(key) {}
   InternalVariant(unsigned short key, const Variant& v) : Variant(key, v) {}
@@ -142,7 +164,7 @@ class LODESTACK_EXPORT InternalVariant : public Variant {
   InternalVariant(InternalVariant&& v) noexcept = default;
   InternalVariant& operator=(const InternalVariant& v) = default;
   InternalVariant& operator=(InternalVariant&& v) noexcept = default;
-  ~InternalVariant() override;
+  ~InternalVariant() override = default;
 };
 
 }  // namespace gom

@@ -16,6 +16,8 @@
 #ifndef LODESTACK_STREAM_BUFFER_H
 #define LODESTACK_STREAM_BUFFER_H
 
+#include <cstring>
+
 #include "lodestack/core/Export.h"
 #include "lodestack/core/Status.h"
 
@@ -63,12 +65,25 @@ class LODESTACK_EXPORT Buffer {
 
   // Appends n bytes; appending nothing changes nothing (an empty buffer
   // stays without an array).
-  void append(const unsigned char* src, unsigned int n);
+  void append(const unsigned char* src, unsigned int n) {
+    if (n == 0) return;
+    unsigned char* dst = capacity_ - size_ >= n ? data_ + size_ : grow(n);
+    copyBytes(dst, src, n);
+    size_ += n;
+  }
   // Appends n bytes of `value`.
   void fill(unsigned char value, unsigned int n);
   // Copies up to n bytes from the cursor to dst and advances the cursor;
   // with `rewind` the cursor goes to 0 first. Returns the bytes copied.
-  unsigned int read(unsigned char* dst, unsigned int n, bool rewind);
+  unsigned int read(unsigned char* dst, unsigned int n, bool rewind) {
+    if (rewind) readPos_ = 0;
+    const unsigned int left = leftForReading();
+    const unsigned int m = n < left ? n : left;
+    if (m == 0) return 0;
+    copyBytes(dst, data_ + readPos_, m);
+    readPos_ += m;
+    return m;
+  }
   // Moves the cursor onto an existing byte: pos must be below size().
   // InvalidArgument (and no move) otherwise.
   [[nodiscard]] Status setReadPosition(unsigned int pos);
@@ -85,6 +100,24 @@ class LODESTACK_EXPORT Buffer {
   void reserve(unsigned int n);
 
  private:
+  // The byte format moves many fields of 1 to 12 bytes: copy those with two
+  // overlapping fixed-width moves instead of a call.
+  static void copyBytes(unsigned char* dst, const unsigned char* src, unsigned int n) {
+    if (n >= 8 && n <= 16) {
+      std::memcpy(dst, src, 8);
+      std::memcpy(dst + n - 8, src + n - 8, 8);
+    } else if (n >= 4 && n < 8) {
+      std::memcpy(dst, src, 4);
+      std::memcpy(dst + n - 4, src + n - 4, 4);
+    } else if (n >= 2 && n < 4) {
+      std::memcpy(dst, src, 2);
+      std::memcpy(dst + n - 2, src + n - 2, 2);
+    } else if (n == 1) {
+      *dst = *src;
+    } else {
+      std::memcpy(dst, src, n);
+    }
+  }
   void takeFrom(Buffer& source);
   unsigned char* grow(unsigned int n);
 

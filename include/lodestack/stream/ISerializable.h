@@ -13,7 +13,7 @@ class IStream;
 
 class LODESTACK_EXPORT ISerializable {
  public:
-  virtual ~ISerializable();
+  virtual ~ISerializable() = default;
   virtual bool write(IStream& stream) const = 0;
   virtual bool read(IStream& stream) = 0;
 };
