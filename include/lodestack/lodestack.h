@@ -3,7 +3,20 @@
 #define LODESTACK_LODESTACK_H
 
 // core
+#include "lodestack/core/AsyncCallDispatcher.h"
+#include "lodestack/core/AsyncCallDispatcherCommon.h"
 #include "lodestack/core/Export.h"
+#include "lodestack/core/IAsyncCallDispatcher.h"
+#include "lodestack/core/IAsyncCallReceiver.h"
+#include "lodestack/core/IMutex.h"
+#include "lodestack/core/IPollSink.h"
+#include "lodestack/core/ISemaphore.h"
+#include "lodestack/core/IThread.h"
+#include "lodestack/core/ITimer.h"
+#include "lodestack/core/LinAsyncCallDispatcher.h"
+#include "lodestack/core/LinGlibAsyncCallDispatcher.h"
+#include "lodestack/core/LinPollAsyncCallDispatcher.h"
+#include "lodestack/core/Lockable.h"
 #include "lodestack/core/Status.h"
 
 // gom

@@ -1,0 +1,45 @@
+// IAsyncCallDispatcher: the event loop of one thread.
+//
+// Every deferred call, descriptor event and timer expiry of the library runs
+// on the thread that owns the dispatcher (the thread that opened it through
+// AsyncCallDispatcher::openDispatcher) from inside its sleep operations, or,
+// for the GLib kind, from the thread's GLib main loop. Any thread may queue
+// and remove calls; sleep belongs to the owning thread only. Reference
+// counted with a non-atomic count: copy and drop SharedPointers on the owning
+// thread only, and hand other threads a plain pointer for queueing.
+#ifndef LODESTACK_CORE_IASYNCCALLDISPATCHER_H
+#define LODESTACK_CORE_IASYNCCALLDISPATCHER_H
+
+#include "lodestack/core/Export.h"
+#include "lodestack/core/IAsyncCallReceiver.h"
+#include "lodestack/gom/ReferenceCountable.h"
+
+namespace lodestack {
+namespace core {
+
+class LODESTACK_EXPORT IAsyncCallDispatcher : public gom::ReferenceCountable {
+ public:
+  ~IAsyncCallDispatcher() override;
+
+  // Queue one call of function(param) (or receiver->handleAsyncCall(param))
+  // on the owning thread. True when stored; false when the lock could not be
+  // taken. Any thread. Each stored call runs at most once, in queueing order.
+  virtual bool queueAsyncCall(void (*function)(void*), void* param) = 0;
+  virtual bool queueAsyncCall(IAsyncCallReceiver* receiver, void* param) = 0;
+  // Drop pending calls. Deliberately broad: the function form drops every
+  // pending function call whatever its function, the receiver form every
+  // pending receiver call whatever its receiver (a null receiver: nothing).
+  virtual void removeAllAsyncCall(void (*function)(void*)) = 0;
+  virtual void removeAllAsyncCall(IAsyncCallReceiver* receiver) = 0;
+
+  // sleep(-1) == 1: blocks until one event was handled.
+  virtual bool sleep() = 0;
+  // Waits up to `timeoutMs` (-1: no limit) and handles what is ready. The
+  // result depends on the kind; see the back-ends.
+  virtual int sleep(int timeoutMs) = 0;
+};
+
+}  // namespace core
+}  // namespace lodestack
+
+#endif  // LODESTACK_CORE_IASYNCCALLDISPATCHER_H
