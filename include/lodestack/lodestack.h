@@ -47,6 +47,7 @@
 #include "lodestack/schema/EUtra.h"
 #include "lodestack/schema/Geran.h"
 #include "lodestack/schema/GenericObjectWrapper.h"
+#include "lodestack/schema/Gnss.h"
 #include "lodestack/schema/InternalUtility.h"
 #include "lodestack/schema/MeasurementBase.h"
 #include "lodestack/schema/MeasurementContainer.h"

@@ -6,6 +6,7 @@
 #include "lodestack/schema/CellularObject.h"
 #include "lodestack/schema/EUtra.h"
 #include "lodestack/schema/Geran.h"
+#include "lodestack/schema/Gnss.h"
 #include "lodestack/schema/PositionEstimate.h"
 #include "lodestack/schema/UtraFdd.h"
 #include "lodestack/schema/UtraTdd.h"
@@ -86,7 +87,8 @@ gom::SharedPointer<gom::ObjectBase> ObjectBaseFactory::createObject(unsigned sho
       return UtraTddServingCellMeasurement::create();
     case UtraTddNwMeasurement::kTypeId:
       return UtraTddNwMeasurement::create();
-    // 130 GnssMeasurementData is not built yet.
+    case GnssMeasurementData::kTypeId:
+      return GnssMeasurementData::create();
     default:
       return gom::SharedPointer<gom::ObjectBase>();
   }

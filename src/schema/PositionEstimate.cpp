@@ -33,6 +33,36 @@ Pointer PositionEstimate::create(double latitude, double longitude, double major
   return p;
 }
 
+bool PositionEstimate::admissible(unsigned int bit, double v) {
+  switch (bit) {
+    case Latitude:
+      return v >= -90.0 && v <= 90.0;
+    case Longitude:
+    case Course:
+      return v >= -180.0 && v < 180.0;
+    case HorizontalCepUncertainty:
+    case MajorAxis:
+    case MinorAxis:
+      return v > 0.0 && v <= 4294967295.0;
+    case Angle:
+      return v >= 0.0 && v < 180.0;
+    case Altitude:
+      return v >= -16383.5 && v <= 16383.5;
+    case AltitudeUncertainty:
+      return v > 0.0 && v <= 65535.0;
+    case Speed:
+      return v >= 0.0;
+    case SpeedUncertainty:
+      return v > 0.0;
+    case CourseUncertainty:
+      return v > 0.0 && v < 180.0;
+    case TimeStamp:
+      return v != 0.0;
+    default:
+      return true;
+  }
+}
+
 unsigned int PositionEstimate::horizontalAccuracy() const {
   return static_cast<unsigned int>(horizontalCepUncertainty());
 }

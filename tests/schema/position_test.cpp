@@ -111,3 +111,94 @@ TEST(PositionEstimate, FactoriesBytesAndDump) {
             "angle 30.0 t 9");
   EXPECT_NE(p->dumpShort("x", "y", true).find("tech 5"), std::string::npos);
 }
+
+TEST(Gnss, MeasurementDataRangesAndBytes) {
+  const Coverage circle(Utility::latitude(47.5), Utility::longitude(8.25), 25.0f);
+  EXPECT_FALSE(GnssMeasurementData::create(circle, -1.0, 1.0, 0.0, 1.0));
+  EXPECT_FALSE(GnssMeasurementData::create(circle, 1.0, 0.0, 0.0, 1.0));
+  EXPECT_FALSE(GnssMeasurementData::create(circle, 1.0, 1.0, 180.0, 1.0));
+  EXPECT_FALSE(GnssMeasurementData::create(circle, 1.0, 1.0, 0.0, 180.0));
+  SharedPointer<GnssMeasurementData> d = GnssMeasurementData::create(circle, 0.0, 1.0, -180.0, 5.0);
+  ASSERT_TRUE(d);
+  EXPECT_EQ(d->setCourse(kNaN), InvalidArgument);
+  EXPECT_EQ(d->course(), -180.0);
+  EXPECT_EQ(d->presenceMask(), 512u | 1024u | 2048u | 4096u);
+
+  BufferStream out;
+  ASSERT_TRUE(d->write(out));
+  // Version, then the coverage (mask 131: latitude, longitude, circle), then
+  // the 32-bit mask and four doubles.
+  ASSERT_EQ(out.buffer().size(), 1u + 1u + 4u + 4u + 4u + 4u + 32u);
+  EXPECT_EQ(out.buffer().data()[1], 131);
+  EXPECT_EQ(out.buffer().data()[14], 0x00);
+  EXPECT_EQ(out.buffer().data()[15], 0x1E) << "mask 0x1E00, little-endian";
+  SharedPointer<GnssMeasurementData> back = GnssMeasurementData::create();
+  BufferStream in(out.buffer().data(), out.buffer().size());
+  ASSERT_TRUE(back->read(in));
+  EXPECT_TRUE(*back == *d);
+  back->setCoverage(Coverage());
+  EXPECT_FALSE(*back == *d) << "the coverage takes part in equality";
+  EXPECT_TRUE(*GnssMeasurementData::create(d) == *d);
+}
+
+TEST(Gnss, ConversionsBetweenEstimateAndData) {
+  SharedPointer<PositionEstimate> p = PositionEstimate::create(-33.9, 151.2, 120.7, 80.2, 45.0, 77u);
+  ASSERT_TRUE(p);
+  ASSERT_EQ(p->setAltitude(-12.5), Ok);
+  ASSERT_EQ(p->setSpeed(2.5), Ok);
+  ASSERT_EQ(p->setCourse(-90.0), Ok);
+  p->setTechnology(PositionEstimate::TechnologyCellular);
+
+  SharedPointer<GnssMeasurementData> d = GnssMeasurementData::create(*p);
+  ASSERT_TRUE(d);
+  const Coverage& c = d->coverage();
+  EXPECT_EQ(c.latitude(), Utility::latitude(-33.9));
+  EXPECT_EQ(c.majorAxis(), 120u) << "truncated";
+  EXPECT_EQ(c.minorAxis(), 80u);
+  EXPECT_FALSE(c.valueExists(Coverage::HorizontalCepUncertainty)) << "absent stays absent";
+  EXPECT_EQ(d->presenceMask(), 512u | 2048u);
+
+  SharedPointer<PositionEstimate> q = d->toPosition();
+  ASSERT_TRUE(q);
+  EXPECT_EQ(q->technology(), 1u) << "always GNSS";
+  EXPECT_NEAR(q->latitude(), -33.9, 90.0 / 2147483648.0);
+  EXPECT_NEAR(q->longitude(), 151.2, 180.0 / 2147483648.0);
+  EXPECT_EQ(q->majorAxis(), 120.0);
+  EXPECT_EQ(q->altitude(), -12.5);
+  EXPECT_EQ(q->course(), -90.0);
+  EXPECT_FALSE(q->valueExists(PositionEstimate::TimeStamp | PositionEstimate::SpeedUncertainty));
+
+  SharedPointer<GnssMeasurementData> zeroAxis =
+      GnssMeasurementData::create(Coverage(0, 0, 0u, 0u, 10.0f));
+  EXPECT_FALSE(zeroAxis->toPosition()) << "the estimate refuses a 0 m axis";
+}
+
+TEST(Gnss, MeasurementAndInjection) {
+  SharedPointer<PositionEstimate> p = PositionEstimate::create(10.0, 20.0, 30.0, 1234u);
+  SharedPointer<GnssMeasurement> m = GnssMeasurement::create(*p);
+  ASSERT_TRUE(m);
+  EXPECT_EQ(m->key(), 21);
+  EXPECT_TRUE(m->valueExists(0x6));
+  EXPECT_FALSE(m->valueExists(0x1)) << "no dn";
+  EXPECT_FALSE(m->valueExists(0x8));
+  EXPECT_EQ(m->timeStamp(), 1234u);
+  SharedPointer<PositionEstimate> back = m->toPosition();
+  ASSERT_TRUE(back);
+  EXPECT_EQ(back->timeStamp(), 1234u);
+  EXPECT_EQ(back->technology(), 1u);
+  EXPECT_EQ(back->horizontalCepUncertainty(), 30.0);
+
+  m->unset(0x2);
+  EXPECT_FALSE(m->toPosition()) << "no time stamp";
+  m->unset(0x4);
+  EXPECT_EQ(thrownBy([&] { (void)m->measurementData(); }), NotFound);
+
+  SharedPointer<GnssInjection> i =
+      GnssInjection::create(99u, GnssMeasurementData::create(Coverage(1, 2, 3.0f)));
+  ASSERT_TRUE(i);
+  EXPECT_EQ(i->key(), 13);
+  EXPECT_EQ(i->gnssMeasurementData()->coverage().longitude(), 2);
+  EXPECT_TRUE(GnssInjection::create(i->wrappedObject()));
+  EXPECT_FALSE(GnssMeasurement::create(i->wrappedObject())) << "type 13 is not a measurement";
+  EXPECT_TRUE(GnssMeasurement::create());
+}

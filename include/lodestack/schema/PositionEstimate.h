@@ -100,27 +100,25 @@ class LODESTACK_EXPORT PositionEstimate
   Source source() const { return static_cast<Source>(present<13>()); }
   unsigned int timeStamp() const { return present<14>(); }
 
-  [[nodiscard]] Status setLatitude(double v) { return checked<0>(v, v >= -90.0 && v <= 90.0); }
-  [[nodiscard]] Status setLongitude(double v) { return checked<1>(v, v >= -180.0 && v < 180.0); }
-  [[nodiscard]] Status setHorizontalCepUncertainty(double v) { return checked<2>(v, isLength(v)); }
-  [[nodiscard]] Status setMajorAxis(double v) { return checked<3>(v, isLength(v)); }
-  [[nodiscard]] Status setMinorAxis(double v) { return checked<4>(v, isLength(v)); }
-  [[nodiscard]] Status setAngle(double v) { return checked<5>(v, v >= 0.0 && v < 180.0); }
-  [[nodiscard]] Status setAltitude(double v) {
-    return checked<6>(v, v >= -16383.5 && v <= 16383.5);
-  }
-  [[nodiscard]] Status setAltitudeUncertainty(double v) {
-    return checked<7>(v, v > 0.0 && v <= 65535.0);
-  }
-  [[nodiscard]] Status setSpeed(double v) { return checked<8>(v, v >= 0.0); }
-  [[nodiscard]] Status setSpeedUncertainty(double v) { return checked<9>(v, v > 0.0); }
-  [[nodiscard]] Status setCourse(double v) { return checked<10>(v, v >= -180.0 && v < 180.0); }
-  [[nodiscard]] Status setCourseUncertainty(double v) {
-    return checked<11>(v, v > 0.0 && v < 180.0);
-  }
+  [[nodiscard]] Status setLatitude(double v) { return checked<0>(v); }
+  [[nodiscard]] Status setLongitude(double v) { return checked<1>(v); }
+  [[nodiscard]] Status setHorizontalCepUncertainty(double v) { return checked<2>(v); }
+  [[nodiscard]] Status setMajorAxis(double v) { return checked<3>(v); }
+  [[nodiscard]] Status setMinorAxis(double v) { return checked<4>(v); }
+  [[nodiscard]] Status setAngle(double v) { return checked<5>(v); }
+  [[nodiscard]] Status setAltitude(double v) { return checked<6>(v); }
+  [[nodiscard]] Status setAltitudeUncertainty(double v) { return checked<7>(v); }
+  [[nodiscard]] Status setSpeed(double v) { return checked<8>(v); }
+  [[nodiscard]] Status setSpeedUncertainty(double v) { return checked<9>(v); }
+  [[nodiscard]] Status setCourse(double v) { return checked<10>(v); }
+  [[nodiscard]] Status setCourseUncertainty(double v) { return checked<11>(v); }
   Status setTechnology(unsigned int v) { return setField<12>(v); }
   Status setSource(Source v) { return setField<13>(static_cast<unsigned int>(v)); }
-  [[nodiscard]] Status setTimeStamp(unsigned int v) { return checked<14>(v, v != 0); }
+  [[nodiscard]] Status setTimeStamp(unsigned int v) { return checked<14>(v); }
+
+  // Whether `value` is admissible for the property of presence bit `bit`
+  // (the table above); NaN never is. Bits without a range admit anything.
+  static bool admissible(unsigned int bit, double value);
 
   // Integer views of horizontalCepUncertainty (truncated) and of
   // altitudeUncertainty (truncated, then its low 16 bits). The getters
@@ -142,10 +140,9 @@ class LODESTACK_EXPORT PositionEstimate
     return field<I>();
   }
   template <std::size_t I>
-  Status checked(const Table::TypeAt<I>& v, bool admissible) {
-    return admissible ? setField<I>(v) : InvalidArgument;
+  Status checked(const Table::TypeAt<I>& v) {
+    return admissible(Table::bitOf<I>(), v) ? setField<I>(v) : InvalidArgument;
   }
-  static bool isLength(double v) { return v > 0.0 && v <= 4294967295.0; }
 };
 
 }  // namespace schema
