@@ -101,21 +101,12 @@ template <class Self, unsigned short TypeId, class Nw, class TableT, class... Vi
 class LODESTACK_EXPORT ServingCellMeasurementRecord : public Record<Self, TypeId, TableT> {
   using Base = Record<Self, TypeId, TableT>;
 
-  template <std::size_t... I>
-  static constexpr std::size_t findNw(std::index_sequence<I...>) {
-    std::size_t found = 0;
-    ((std::is_same<typename TableT::template TypeAt<I>, gom::SharedPointer<Nw>>::value
-          ? (found = I, true)
-          : false),
-     ...);
-    return found;
-  }
-
  public:
   using Table = TableT;
   using NwMeasurement = Nw;
   using Mask = unsigned char;
-  static constexpr std::size_t kNwField = findNw(std::make_index_sequence<TableT::kFieldCount>());
+  static constexpr std::size_t kNwField = TableT::template indexOf<gom::SharedPointer<Nw>>();
+  static_assert(kNwField < TableT::kFieldCount, "the table must hold the network measurement");
   static constexpr Mask kViaBits = static_cast<Mask>((0u | ... | Vias::bit));
 
   bool valueExists(Mask mask) const {

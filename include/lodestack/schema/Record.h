@@ -107,6 +107,16 @@ class LODESTACK_EXPORT FieldTable {
     return static_cast<Mask>(bits[I]);
   }
 
+  // The index of the first field of type T; kFieldCount when there is none.
+  template <class T>
+  static constexpr std::size_t indexOf() {
+    constexpr bool match[] = {std::is_same<typename Fields::Type, T>::value..., false};
+    for (std::size_t i = 0; i < kFieldCount; ++i) {
+      if (match[i]) return i;
+    }
+    return kFieldCount;
+  }
+
   bool valueExists(Mask mask) const { return (mask_ & mask) == mask; }
   void unset(Mask mask) { mask_ = static_cast<Mask>(mask_ & ~mask); }
   Mask presenceMask() const { return mask_; }
