@@ -48,6 +48,7 @@
 #include "lodestack/schema/Geran.h"
 #include "lodestack/schema/GenericObjectWrapper.h"
 #include "lodestack/schema/Gnss.h"
+#include "lodestack/schema/Injection.h"
 #include "lodestack/schema/InternalUtility.h"
 #include "lodestack/schema/MeasurementBase.h"
 #include "lodestack/schema/MeasurementContainer.h"
