@@ -2,10 +2,14 @@
 // objects, beside memcpy of the same number of bytes and protobuf encoding
 // and decoding the same content, all in one run.
 //
-// The tree: a container holding one GSM-like object (4 scalars and 6
-// neighbours of 3 scalars), one WCDMA-like object (3 scalars and 8
-// neighbours of 6 scalars) and 30 WLAN-like objects (an 8-byte string and 3
-// scalars each).
+// Two trees. The generic one: a container holding one GSM-like object (4
+// scalars and 6 neighbours of 3 scalars), one WCDMA-like object (3 scalars
+// and 8 neighbours of 6 scalars) and 30 WLAN-like objects (an 8-byte string
+// and 3 scalars each). The measurement container: one GERAN measurement
+// (identity, time stamp, serving cell measurement, 6 neighbours), one
+// UTRA-FDD measurement (8 neighbours with every value), one E-UTRA identity,
+// 30 WLAN measurements (8-byte BSSID, time stamp, access point measurement
+// with rxLevel, txLevel and rssi) and one GNSS measurement.
 #include <cstring>
 #include <vector>
 
@@ -20,6 +24,7 @@
 
 using namespace lodestack;
 using namespace lodestack::gom;
+using namespace lodestack::schema;
 
 namespace {
 
@@ -120,6 +125,92 @@ void BM_Memcpy(benchmark::State& state) {
 }
 BENCHMARK(BM_Memcpy);
 
+
+SharedPointer<MeasurementContainer> buildContainer() {
+  SharedPointer<MeasurementContainer> c = MeasurementContainer::create();
+  const unsigned int now = 1700000000u;
+
+  SharedPointer<GeranCellMeasurement> geran =
+      GeranCellMeasurement::create(GeranCellDn::create(244, 91, 1234, 23456), now);
+  SharedPointer<GeranServingCellMeasurement> serving = GeranServingCellMeasurement::create();
+  (void)serving->setTimingAdvance(3);
+  (void)serving->setFrequency(1);
+  (void)serving->setRxLevel(40);
+  (void)serving->setFrequencyInfo(GeranFrequencyInfo::create(17, 62));
+  geran->setServingCellMeasurement(serving);
+  for (int i = 0; i < 6; ++i) {
+    SharedPointer<GeranNwMeasurement> n = GeranNwMeasurement::create(
+        GeranFrequencyInfo::create(static_cast<unsigned char>(10 + i), static_cast<unsigned short>(100 + i)));
+    (void)n->setLac(1234);
+    (void)n->setCid(static_cast<unsigned short>(23000 + i));
+    (void)n->setRxLevel(static_cast<unsigned char>(30 - i));
+    (void)geran->addNwMeasurement(n);
+  }
+  (void)c->addGeranMeasurement(geran->wrappedObject());
+
+  SharedPointer<UtraFddCellMeasurement> utra =
+      UtraFddCellMeasurement::create(UtraCellDn::create(244, 91, 0x0ABCDEF1), now);
+  for (int i = 0; i < 8; ++i) {
+    SharedPointer<UtraFddNwMeasurement> n = UtraFddNwMeasurement::create(
+        UtraFddFrequencyInfo::create(10700, static_cast<unsigned short>(300 + i)));
+    (void)n->setUarfcnUl(9750);
+    (void)n->setUtraCarrierRssi(static_cast<unsigned char>(50 + i));
+    (void)n->setUcid(0x0ABCDE00u + i);
+    (void)n->setEcNo(static_cast<unsigned char>(20 + i));
+    (void)n->setRscp(static_cast<signed char>(-95 + i));
+    (void)n->setPathloss(static_cast<unsigned char>(120 + i));
+    (void)utra->addNwMeasurement(n);
+  }
+  (void)c->addUtraFddMeasurement(utra->wrappedObject());
+
+  SharedPointer<EUtraCellMeasurement> eutra =
+      EUtraCellMeasurement::create(EUtraCellDn::create(244, 91, 0x01234567), now);
+  (void)c->addEUtraMeasurement(eutra->wrappedObject());
+
+  for (int i = 0; i < 30; ++i) {
+    SharedPointer<WlanMeasurement> w =
+        WlanMeasurement::create(WlanDn::create(0x001A2B3C4D5E0000ull + i), now);
+    SharedPointer<WlanApMeasurement> ap = WlanApMeasurement::create();
+    (void)ap->setRxLevel(static_cast<signed char>(-40 - i));
+    (void)ap->setTxLevel(static_cast<signed char>(15));
+    (void)ap->setRssi(static_cast<unsigned char>(60 + i));
+    w->setWlanApMeasurement(ap);
+    (void)c->addWlanMeasurement(w->wrappedObject());
+  }
+
+  const Coverage fix(717000000, 148000000, 25u, 15u, 30.0f, 12.5f, 5.0f);
+  SharedPointer<GnssMeasurement> gnss =
+      GnssMeasurement::create(now, GnssMeasurementData::create(fix, 1.5, 0.5, 270.0, 10.0));
+  (void)c->addGnssMeasurement(gnss->wrappedObject());
+  return c;
+}
+
+void BM_Container_Write(benchmark::State& state) {
+  SharedPointer<MeasurementContainer> container = buildContainer();
+  unsigned int bytes = 0;
+  for (auto _ : state) {
+    BufferStream s;
+    container->write(s);
+    bytes = s.buffer().size();
+    benchmark::DoNotOptimize(s.buffer().data());
+  }
+  state.counters["bytes"] = bytes;
+}
+BENCHMARK(BM_Container_Write);
+
+void BM_Container_Read(benchmark::State& state) {
+  BufferStream out;
+  buildContainer()->write(out);
+  BufferStream s(out.buffer());
+  for (auto _ : state) {
+    s.seekFromStart(0);
+    SharedPointer<GenericObject> back = GenericObject::create(s);
+    benchmark::DoNotOptimize(back.get());
+  }
+  state.counters["bytes"] = s.buffer().size();
+}
+BENCHMARK(BM_Container_Read);
+
 #ifdef LODESTACK_BENCH_HAVE_PROTOBUF
 lodestack_bench::Container buildMessage() {
   lodestack_bench::Container c;
@@ -158,8 +249,79 @@ lodestack_bench::Container buildMessage() {
   return c;
 }
 
-void BM_Protobuf_Encode(benchmark::State& state) {
-  const lodestack_bench::Container message = buildMessage();
+lodestack_bench::MeasurementSet buildMeasurementSet() {
+  lodestack_bench::MeasurementSet m;
+  const unsigned int now = 1700000000u;
+  lodestack_bench::GeranMeasurement* geran = m.add_geran();
+  geran->mutable_dn()->set_mcc(244);
+  geran->mutable_dn()->set_mnc(91);
+  geran->mutable_dn()->set_lac(1234);
+  geran->mutable_dn()->set_cid(23456);
+  geran->set_time_stamp(now);
+  geran->mutable_serving()->set_timing_advance(3);
+  geran->mutable_serving()->set_frequency(1);
+  geran->mutable_serving()->mutable_nw()->set_rx_level(40);
+  geran->mutable_serving()->mutable_nw()->mutable_frequency_info()->set_bsic(17);
+  geran->mutable_serving()->mutable_nw()->mutable_frequency_info()->set_arfcn(62);
+  for (int i = 0; i < 6; ++i) {
+    lodestack_bench::GeranNw* n = geran->add_neighbours();
+    n->mutable_frequency_info()->set_bsic(10 + i);
+    n->mutable_frequency_info()->set_arfcn(100 + i);
+    n->set_lac(1234);
+    n->set_cid(23000 + i);
+    n->set_rx_level(30 - i);
+  }
+  lodestack_bench::UtraMeasurement* utra = m.add_utra_fdd();
+  utra->mutable_dn()->set_mcc(244);
+  utra->mutable_dn()->set_mnc(91);
+  utra->mutable_dn()->set_ucid(0x0ABCDEF1);
+  utra->set_time_stamp(now);
+  for (int i = 0; i < 8; ++i) {
+    lodestack_bench::UtraNw* n = utra->add_neighbours();
+    n->mutable_frequency_info()->set_uarfcn_dl(10700);
+    n->mutable_frequency_info()->set_pcpich(300 + i);
+    n->set_uarfcn_ul(9750);
+    n->set_carrier_rssi(50 + i);
+    n->set_ucid(0x0ABCDE00u + i);
+    n->set_ec_no(20 + i);
+    n->set_rscp(-95 + i);
+    n->set_pathloss(120 + i);
+  }
+  lodestack_bench::EUtraMeasurement* eutra = m.add_eutra();
+  eutra->mutable_dn()->set_mcc(244);
+  eutra->mutable_dn()->set_mnc(91);
+  eutra->mutable_dn()->set_ucid(0x01234567);
+  eutra->set_time_stamp(now);
+  for (int i = 0; i < 30; ++i) {
+    lodestack_bench::WlanMeasurement* w = m.add_wlan();
+    const unsigned long long id = 0x001A2B3C4D5E0000ull + i;
+    char bssid[8];
+    for (int b = 0; b < 8; ++b) bssid[b] = static_cast<char>(id >> (56 - 8 * b));
+    w->set_bssid(bssid, 8);
+    w->set_time_stamp(now);
+    w->mutable_ap()->set_rx_level(-40 - i);
+    w->mutable_ap()->set_tx_level(15);
+    w->mutable_ap()->set_rssi(60 + i);
+  }
+  lodestack_bench::GnssMeasurement* gnss = m.add_gnss();
+  gnss->set_time_stamp(now);
+  lodestack_bench::GnssData* d = gnss->mutable_data();
+  d->set_latitude(717000000);
+  d->set_longitude(148000000);
+  d->set_major_axis(25);
+  d->set_minor_axis(15);
+  d->set_angle(30.0f);
+  d->set_altitude(12.5f);
+  d->set_altitude_uncertainty(5.0f);
+  d->set_speed(1.5);
+  d->set_speed_uncertainty(0.5);
+  d->set_course(270.0);
+  d->set_course_uncertainty(10.0);
+  return m;
+}
+
+template <class Message>
+void encode(benchmark::State& state, const Message& message) {
   std::vector<unsigned char> out(message.ByteSizeLong());
   for (auto _ : state) {
     const size_t size = message.ByteSizeLong();
@@ -169,18 +331,26 @@ void BM_Protobuf_Encode(benchmark::State& state) {
   }
   state.counters["bytes"] = message.ByteSizeLong();
 }
-BENCHMARK(BM_Protobuf_Encode);
 
-void BM_Protobuf_Decode(benchmark::State& state) {
-  const std::string bytes = buildMessage().SerializeAsString();
+template <class Message>
+void decode(benchmark::State& state, const Message& message) {
+  const std::string bytes = message.SerializeAsString();
   for (auto _ : state) {
-    lodestack_bench::Container fresh;
+    Message fresh;
     fresh.ParseFromArray(bytes.data(), static_cast<int>(bytes.size()));
     benchmark::DoNotOptimize(&fresh);
   }
   state.counters["bytes"] = bytes.size();
 }
+
+void BM_Protobuf_Encode(benchmark::State& state) { encode(state, buildMessage()); }
+BENCHMARK(BM_Protobuf_Encode);
+void BM_Protobuf_Decode(benchmark::State& state) { decode(state, buildMessage()); }
 BENCHMARK(BM_Protobuf_Decode);
+void BM_ContainerProtobuf_Encode(benchmark::State& state) { encode(state, buildMeasurementSet()); }
+BENCHMARK(BM_ContainerProtobuf_Encode);
+void BM_ContainerProtobuf_Decode(benchmark::State& state) { decode(state, buildMeasurementSet()); }
+BENCHMARK(BM_ContainerProtobuf_Decode);
 #endif
 
 }  // namespace
@@ -190,6 +360,8 @@ int main(int argc, char** argv) {
   lodestack_bench::RatioReporter reporter;
   reporter.compare("BM_GenericObject_Write", "BM_Protobuf_Encode", 3.0);
   reporter.compare("BM_GenericObject_Read", "BM_Protobuf_Decode", 2.0);
+  reporter.compare("BM_Container_Write", "BM_ContainerProtobuf_Encode", 3.0);
+  reporter.compare("BM_Container_Read", "BM_ContainerProtobuf_Decode", 2.0);
 #ifndef LODESTACK_BENCH_HAVE_PROTOBUF
   std::printf("protobuf was not found at build time: the reference cases are missing\n");
 #endif
