@@ -79,6 +79,7 @@ void AsyncCallDispatcherCommon::invokeDelegate(unsigned int id) {
     // Found and erased in one step: the call runs at most once.
     ScopedLock lock(pending_);
     DelegateMap& map = pending_.value();
+    duringTake();
     const auto it = map.find(id);
     if (it == map.end()) return;
     delegate = it->second;

@@ -19,7 +19,7 @@ constexpr int kSendBufferBytes = 4 * 1024 * 1024;
 }  // namespace
 
 LinAsyncCallDispatcher::LinAsyncCallDispatcher()
-    : readFd_(0), writeFd_(0), hasUnsent_(false) {}
+    : readFd_(0), writeFd_(0), hasUnsent_(false), stalled_(false) {}
 
 LinAsyncCallDispatcher::~LinAsyncCallDispatcher() {
   if (readFd_ != 0) close(readFd_);
@@ -41,11 +41,12 @@ bool LinAsyncCallDispatcher::sendId(unsigned int id) {
   return send(writeFd_, &id, sizeof id, MSG_DONTWAIT | MSG_EOR) == sizeof id;
 }
 
-// Lock held (we are called from addDelegate). Older remembered ids go first
-// so that records always travel in id order.
+// Lock held (we are called from addDelegate). While earlier ids wait to be
+// sent, the pair is full and records are on their way to the owner, who
+// sends the waiting ids after consuming each record; this id joins the end
+// of the queue so that records always travel in id order.
 bool LinAsyncCallDispatcher::doScheduleDelegate(unsigned int id) {
   if (writeFd_ == 0) return false;
-  if (!unsent_.empty()) flushUnsentLocked();
   if (unsent_.empty() && sendId(id)) return true;
   unsent_.push_back(id);
   hasUnsent_.store(true, std::memory_order_relaxed);
@@ -55,13 +56,13 @@ bool LinAsyncCallDispatcher::doScheduleDelegate(unsigned int id) {
 void LinAsyncCallDispatcher::flushUnsentLocked() {
   while (!unsent_.empty() && sendId(unsent_.front())) unsent_.pop_front();
   hasUnsent_.store(!unsent_.empty(), std::memory_order_relaxed);
+  stalled_.store(false, std::memory_order_relaxed);
 }
 
-// A producer that finds the pair full remembers its id, and that can only
-// happen while records are waiting, so the owner always gets another turn
-// here after consuming one.
+// Only needed when a resend failed for another reason than a full pair
+// (see duringTake); then the pair may have run dry with ids still waiting.
 void LinAsyncCallDispatcher::resendUnsent() {
-  if (!hasUnsent_.load(std::memory_order_relaxed)) return;
+  if (!stalled_.load(std::memory_order_relaxed)) return;
   ScopedLock lock(pendingLock());
   flushUnsentLocked();
 }
@@ -73,8 +74,20 @@ void LinAsyncCallDispatcher::handlePollEvent(const pollfd&) { invokeApc(); }
 void LinAsyncCallDispatcher::invokeApc() {
   unsigned int id = 0;
   if (recv(readFd_, &id, sizeof id, MSG_DONTWAIT) != sizeof id) return;
-  resendUnsent();
   invokeDelegate(id);
+}
+
+// The record just consumed made room for exactly one more, and producers
+// send nothing while ids wait: send the oldest waiting id. A failure here
+// cannot be for lack of room, so the next sleep retries them all.
+void LinAsyncCallDispatcher::duringTake() {
+  if (!hasUnsent_.load(std::memory_order_relaxed) || unsent_.empty()) return;
+  if (sendId(unsent_.front())) {
+    unsent_.pop_front();
+    hasUnsent_.store(!unsent_.empty(), std::memory_order_relaxed);
+  } else {
+    stalled_.store(true, std::memory_order_relaxed);
+  }
 }
 
 bool LinAsyncCallDispatcher::attachPollSink(const pollfd& p, IPollSink* sink) {

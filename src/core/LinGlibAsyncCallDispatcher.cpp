@@ -135,8 +135,11 @@ int LinGlibAsyncCallDispatcher::dispatchStatic(_GSource* source, int (*)(void*),
   // the list, marked, until the walk is over.
   for (PollEntry& entry : self->entries_) {
     if (entry.events == 0 || entry.revents != G_IO_IN) continue;
-    pollfd p = {entry.fd, POLLIN, 0};
-    if (poll(&p, 1, 0) == 1 && p.revents == POLLIN) self->invokeCallback(p);
+    pollfd p = {entry.fd, POLLIN, POLLIN};
+    // An earlier callback may have consumed the input meanwhile.
+    if (!self->readsWithoutBlocking(p.fd) && (poll(&p, 1, 0) != 1 || p.revents != POLLIN))
+      continue;
+    self->invokeCallback(p);
   }
   self->removeDetachedPollers();
   return TRUE;

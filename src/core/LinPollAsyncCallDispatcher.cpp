@@ -1,5 +1,6 @@
 #include "lodestack/core/LinPollAsyncCallDispatcher.h"
 
+#include <algorithm>
 #include <new>
 
 #include "core/DispatcherRegistry.h"
@@ -54,19 +55,30 @@ int LinPollAsyncCallDispatcher::sleep(int timeoutMs) {
   // A callback may drop the last handle to this dispatcher; finish first.
   gom::SharedPointer<LinPollAsyncCallDispatcher> keepAlive(this);
   resendUnsent();
-  // Callbacks may attach or detach while we walk: walk a copy.
-  std::vector<pollfd> ready(watched_);
-  const int n = poll(ready.data(), ready.size(), timeoutMs);
-  if (n < 0) return 0;
-  if (n == 0) return 2;
+  // Callbacks may attach or detach while we walk: walk a copy (on the stack
+  // for the usual handful of descriptors).
+  constexpr size_t kOnStack = 16;
+  pollfd onStack[kOnStack];
+  std::vector<pollfd> onHeap;
+  pollfd* ready = onStack;
+  const size_t n = watched_.size();
+  if (n > kOnStack) {
+    onHeap = watched_;
+    ready = onHeap.data();
+  } else {
+    std::copy(watched_.begin(), watched_.end(), onStack);
+  }
+  const int result = poll(ready, n, timeoutMs);
+  if (result < 0) return 0;
+  if (result == 0) return 2;
   bool handled = false;
-  for (pollfd& p : ready) {
+  for (size_t i = 0; i < n; ++i) {
     // Exactly POLLIN: input together with an error or hang-up is skipped.
-    if (p.revents != POLLIN) continue;
+    if (ready[i].revents != POLLIN) continue;
+    pollfd p = {ready[i].fd, ready[i].events, POLLIN};
     // An earlier callback may have consumed the input meanwhile.
-    pollfd again = {p.fd, p.events, 0};
-    if (poll(&again, 1, 0) == 1 && again.revents == POLLIN && invokeCallback(again))
-      handled = true;
+    if (!readsWithoutBlocking(p.fd) && (poll(&p, 1, 0) != 1 || p.revents != POLLIN)) continue;
+    if (invokeCallback(p)) handled = true;
   }
   return handled ? 1 : 0;
 }

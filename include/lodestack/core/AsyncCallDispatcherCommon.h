@@ -44,6 +44,11 @@ class LODESTACK_EXPORT AsyncCallDispatcherCommon : public IAsyncCallDispatcher {
   // locked, from the queueing thread; the result is informative only.
   virtual bool doScheduleDelegate(unsigned int id) = 0;
 
+  // Called by invokeDelegate with the map locked, before it looks the id up:
+  // lets a back-end do its owning-thread bookkeeping under the same lock.
+  // Does nothing by default.
+  virtual void duringTake() {}
+
   // Runs the call stored under `id`, if it is still pending (owning thread).
   // The entry is removed before the call, so it runs at most once and the
   // target may queue further calls.

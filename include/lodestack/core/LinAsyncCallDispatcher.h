@@ -6,8 +6,8 @@
 // readiness event consumes one record and runs that one call. When the pair
 // is full, the ids that could not be sent are remembered (in order, under the
 // pending map's lock) and sent as soon as the owning thread has consumed a
-// record, ahead of any newer id, so no call is stranded and calls run in id
-// order.
+// record (one for each record consumed), ahead of any newer id, so no call
+// is stranded and calls run in id order.
 //
 // Poll sinks are registered per descriptor (at most one sink each; never
 // descriptor 0). attachPollSink, detachPollSink and all callbacks belong to
@@ -48,14 +48,19 @@ class LODESTACK_EXPORT LinAsyncCallDispatcher : public AsyncCallDispatcherCommon
   // Creates the socket pair; false when it cannot be made.
   bool baseInit();
   bool doScheduleDelegate(unsigned int id) override;
+  void duringTake() override;
   virtual bool doAttachPollSink(const pollfd& p) = 0;
   virtual void doDetachPollSink(const pollfd& p) = 0;
 
   // Calls the sink of the descriptor of `p`: false when there is none or it
   // threw, true otherwise.
   bool invokeCallback(const pollfd& p);
-  // Sends remembered ids if any are waiting (owning thread; takes the lock).
+  // Retries remembered ids after a failed resend (owning thread, before
+  // waiting; takes the lock only then).
   void resendUnsent();
+  // The wake-up socket is read without blocking: it needs no second look
+  // before its sink is called.
+  bool readsWithoutBlocking(int fd) const { return fd == readFd_; }
 
   int readFd_;   // 0 when not created
   int writeFd_;  // 0 when not created
@@ -69,6 +74,7 @@ class LODESTACK_EXPORT LinAsyncCallDispatcher : public AsyncCallDispatcherCommon
   std::map<int, IPollSink*> sinks_;  // owning thread only
   std::deque<unsigned int> unsent_;  // guarded by pendingLock()
   std::atomic<bool> hasUnsent_;      // a hint readable without the lock
+  std::atomic<bool> stalled_;        // a resend failed: retry from sleep
 };
 
 }  // namespace core
