@@ -16,6 +16,16 @@
 using namespace lodestack;
 using lodestack::schema::Utility;
 
+namespace {
+
+// (x - m)^T S^-1 (x - m), written out.
+double quadratic(const ShapeMatrix& s, const Midpoint& m, double x, double y) {
+  const double dx = x - m.latitude(), dy = y - m.longitude();
+  return (s[2] * dx * dx - 2 * s[1] * dx * dy + s[0] * dy * dy) / s.det();
+}
+
+}  // namespace
+
 TEST(ShapeMatrix, EllipseConversion) {
   ShapeMatrix m(1.0, 2.0, 3.0);
   EXPECT_FALSE(m.ellConvert(90.0, 100.0, 50.0, 10.0));
@@ -118,9 +128,7 @@ TEST(EllipseDistance, MahalanobisAndBhattacharyya) {
   // Bhattacharyya distance: -ln of the integral of sqrt(p1 p2) over the
   // plane, summed on a fine grid.
   auto density = [](const ShapeMatrix& s, const Midpoint& m, double x, double y) {
-    const double det = s.det(), dx = x - m.latitude(), dy = y - m.longitude();
-    const double q = (s[2] * dx * dx - 2 * s[1] * dx * dy + s[0] * dy * dy) / det;
-    return std::exp(-0.5 * q) / (2 * M_PI * std::sqrt(det));
+    return std::exp(-0.5 * quadratic(s, m, x, y)) / (2 * M_PI * std::sqrt(s.det()));
   };
   double sum = 0.0;
   const double h = 0.02;
@@ -145,32 +153,16 @@ TEST(EllipseDistance, IntersectAgreesWithSampling) {
   };
   int overlapping = 0, separate = 0;
   for (int trial = 0; trial < 400; ++trial) {
-    const ShapeMatrix s1 = randomShape(), s2 = trial % 10 ? randomShape() : ShapeMatrix();
+    const ShapeMatrix s1 = randomShape(), s2 = randomShape();
     const Midpoint m1(2 * uniform(random), 2 * uniform(random));
     const Midpoint m2(2 * uniform(random), 2 * uniform(random));
-    const double l00 = std::sqrt(s1[0]), l10 = s1[1] / l00;
-    const double l11 = std::sqrt(s1[2] - l10 * l10);
-    auto q2 = [&](double x, double y) {  // (x - m2)^T S2^-1 (x - m2), or a point's test
-      const double dx = x - m2.latitude(), dy = y - m2.longitude();
-      if (s2.det() == 0.0) return dx * dx + dy * dy == 0.0 ? 0.0 : 1e300;
-      return (s2[2] * dx * dx - 2 * s2[1] * dx * dy + s2[0] * dy * dy) / s2.det();
-    };
-    double smallest;
-    if (s2.det() == 0.0) {  // a point: is it inside the first ellipse?
-      const double dx = m2.latitude() - m1.latitude(), dy = m2.longitude() - m1.longitude();
-      smallest = (s1[2] * dx * dx - 2 * s1[1] * dx * dy + s1[0] * dy * dy) / s1.det();
-    } else {
-      smallest = q2(m1.latitude(), m1.longitude());
-      for (int k = 0; k < 20000; ++k) {
-        const double t = 2 * M_PI * k / 20000, c = std::cos(t), s = std::sin(t);
-        for (double radius : {1.0, 0.5})
-          smallest = std::min(smallest, q2(m1.latitude() + radius * l00 * c,
-                                           m1.longitude() + radius * (l10 * c + l11 * s)));
-      }
-      // Inside the first ellipse when the second's centre is.
-      const double dx = m2.latitude() - m1.latitude(), dy = m2.longitude() - m1.longitude();
-      if ((s1[2] * dx * dx - 2 * s1[1] * dx * dy + s1[0] * dy * dy) / s1.det() <= 1.0)
-        smallest = 0.0;
+    const double l00 = std::sqrt(s1[0]), l10 = s1[1] / l00, l11 = std::sqrt(s1[2] - l10 * l10);
+    // Zero when the second centre lies inside the first ellipse.
+    double smallest = quadratic(s1, m1, m2.latitude(), m2.longitude()) <= 1.0 ? 0.0 : 1e300;
+    for (int k = 0; k < 20000; ++k) {
+      const double t = 2 * M_PI * k / 20000, c = std::cos(t), s = std::sin(t);
+      smallest = std::min(smallest, quadratic(s2, m2, m1.latitude() + l00 * c,
+                                              m1.longitude() + l10 * c + l11 * s));
     }
     if (std::fabs(smallest - 1.0) < 1e-3) continue;  // too close to touching to judge
     const bool expected = smallest <= 1.0;
@@ -180,6 +172,10 @@ TEST(EllipseDistance, IntersectAgreesWithSampling) {
   }
   EXPECT_GT(overlapping, 50);
   EXPECT_GT(separate, 50);
+  // Points: inside an ellipse, outside it, and two points.
+  const ShapeMatrix unit(1.0, 0.0, 1.0);
+  EXPECT_TRUE(Utility::intersect(Midpoint(0, 0), unit, Midpoint(0.6, 0.6), ShapeMatrix()));
+  EXPECT_FALSE(Utility::intersect(Midpoint(0, 0), unit, Midpoint(0.8, 0.8), ShapeMatrix()));
   EXPECT_TRUE(Utility::intersect(Midpoint(1, 1), ShapeMatrix(), Midpoint(1, 1), ShapeMatrix()));
   EXPECT_FALSE(Utility::intersect(Midpoint(1, 1), ShapeMatrix(), Midpoint(1, 2), ShapeMatrix()));
 }

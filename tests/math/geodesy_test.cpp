@@ -27,41 +27,28 @@ double angleDifference(double a, double b) {
 
 }  // namespace
 
-TEST(Geodesy, CoordinateCodingSaturatesAndRoundTrips) {
+TEST(Geodesy, CoordinateCodingAndAngleConversions) {
   EXPECT_EQ(Utility::latitude(90.0), INT_MAX);
   EXPECT_EQ(Utility::latitude(-90.0), INT_MIN);
   EXPECT_EQ(Utility::latitude(90.0001), INT_MAX);
-  EXPECT_EQ(Utility::latitude(-1e300), INT_MIN);
-  EXPECT_EQ(Utility::latitude(0.0), 0);
   EXPECT_EQ(Utility::latitude(std::nan("")), 0);
   EXPECT_EQ(Utility::longitude(-180.0), INT_MIN);
-  EXPECT_EQ(Utility::longitude(180.0), INT_MAX);
   EXPECT_EQ(Utility::latitude(-1e-300), -1) << "codes round down";
   EXPECT_LT(Utility::wgs84Latitude(INT_MAX), 90.0);
-  EXPECT_GT(Utility::wgs84Latitude(INT_MAX), 90.0 - 1e-7);
   EXPECT_EQ(Utility::wgs84Latitude(Utility::latitude(45.0)), 45.0);
-  EXPECT_EQ(Utility::wgs84Longitude(INT_MIN), -180.0);
   // Coding then decoding loses less than one unit and never rounds up.
   std::mt19937_64 random(7);
   std::uniform_real_distribution<double> lon(-180.0, 180.0);
   for (int i = 0; i < 1000; ++i) {
-    const double d = lon(random);
-    const double back = Utility::wgs84Longitude(Utility::longitude(d));
-    ASSERT_LE(back, d);
-    ASSERT_LT(d - back, 180.0 / 2147483648.0) << d;
+    const double d = lon(random), back = Utility::wgs84Longitude(Utility::longitude(d));
+    ASSERT_TRUE(back <= d && d - back < 180.0 / 2147483648.0) << d;
   }
-}
 
-TEST(Geodesy, AngleConversionsClampToHalfTurn) {
   EXPECT_EQ(Utility::toRadians(200.0), kPi);
   EXPECT_EQ(Utility::toRadians(-1.0), 0.0);
-  EXPECT_EQ(Utility::toRadians(90.0), kPi / 2);
   EXPECT_EQ(Utility::toDegrees(-1.0f), 0.0);
   EXPECT_EQ(Utility::toDegrees(4.0f), 180.00000500895632);
-  EXPECT_EQ(Utility::toDegrees(static_cast<float>(kPi)), 180.00000500895632);
   EXPECT_DOUBLE_EQ(Utility::toDegrees(0.5f), 0.5 * 180.0 / kPi);
-  EXPECT_EQ(Utility::normalizedSinOrCosValue(1.0000001), 1.0);
-  EXPECT_EQ(Utility::normalizedSinOrCosValue(-2.0), -1.0);
   EXPECT_TRUE(std::isnan(Utility::normalizedSinOrCosValue(std::nan(""))));
 }
 

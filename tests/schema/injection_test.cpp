@@ -41,13 +41,6 @@ TEST(Injection, ServingAndNeighbourCellInjections) {
   EXPECT_FALSE(s->valueExists(0x1));
   EXPECT_EQ(s->timeStamp(), 77u) << "unset removes the flagged properties only";
 
-  // The other technologies' types.
-  EXPECT_EQ(UtraFddServingCellInjection::create()->key(), 7);
-  EXPECT_EQ(UtraTddServingCellInjection::create()->key(), 8);
-  EXPECT_EQ(EUtraServingCellInjection::create()->key(), 15);
-  EXPECT_EQ(CdmaServingCellInjection::create()->key(), 18);
-  EXPECT_EQ(UtraTddNeighborCellInjection::create()->key(), 11);
-  EXPECT_EQ(EUtraNeighborCellInjection::create()->key(), 16);
   EXPECT_EQ(CdmaNeighborCellInjection::create()->key(), 19);
   EXPECT_TRUE(GeranServingCellInjection::create(s->wrappedObject()));
   EXPECT_FALSE(UtraFddServingCellInjection::create(s->wrappedObject()));
