@@ -2,12 +2,17 @@
 #ifndef LODESTACK_TESTS_CORE_CORETESTSUPPORT_H
 #define LODESTACK_TESTS_CORE_CORETESTSUPPORT_H
 
+#include <poll.h>
+#include <sys/socket.h>
+#include <unistd.h>
+
 #include <chrono>
 #include <functional>
 #include <utility>
 
 #include "lodestack/core/AsyncCallDispatcher.h"
 #include "lodestack/core/IAsyncCallDispatcher.h"
+#include "lodestack/core/IPollSink.h"
 #include "lodestack/core/IThread.h"
 #include "lodestack/gom/SharedPointer.h"
 
@@ -53,6 +58,34 @@ inline bool runUntil(IAsyncCallDispatcher& dispatcher, const std::function<bool(
   while (!done() && secondsSince(start) < limitSeconds) dispatcher.sleep(100);
   return done();
 }
+
+// Counts its calls, reads one byte (if any) and runs an optional action.
+struct CountingSink : IPollSink {
+  int calls = 0;
+  std::function<void()> action;
+  void handlePollEvent(const pollfd& p) override {
+    ++calls;
+    char byte;
+    (void)!read(p.fd, &byte, 1);
+    if (action) action();
+  }
+};
+
+// A stream socket pair; the first end is watched, the second written.
+struct SocketPair {
+  int fds[2] = {-1, -1};
+  SocketPair() { socketpair(AF_UNIX, SOCK_STREAM | SOCK_NONBLOCK, 0, fds); }
+  ~SocketPair() {
+    for (int fd : fds)
+      if (fd >= 0) close(fd);
+  }
+  bool fill() { return write(fds[1], "x", 1) == 1; }
+  void closePeer() {
+    close(fds[1]);
+    fds[1] = -1;
+  }
+  pollfd watch() const { return {fds[0], POLLIN, 0}; }
+};
 
 }  // namespace testing
 }  // namespace core
