@@ -36,6 +36,7 @@ Status InternalUtility::getCollection(gom::SharedPointer<gom::GenericObject>& ob
                                       gom::SharedPointer<gom::ValueCollection>& out,
                                       bool& created) {
   created = false;
+  if (!object) return Failed;
   if (object->propertyExists(id)) return object->getCollectionProperty(id, out);
   gom::SharedPointer<gom::ValueCollection> collection = gom::ValueCollection::create();
   if (!collection) return OutOfMemory;

@@ -140,20 +140,3 @@ TEST(Record, CloneIsDeep) {
   EXPECT_NE(copy->extensionReference().get(), outer->extensionReference().get());
   EXPECT_FALSE(Outer::create(SharedPointer<Outer>()));
 }
-
-TEST(ObjectCollection, BytesAndEquality) {
-  SharedPointer<gom::ObjectCollection<Inner>> list = gom::ObjectCollection<Inner>::create();
-  for (unsigned char i = 0; i < 3; ++i) {
-    SharedPointer<Inner> item = Inner::create();
-    item->setA(i);
-    ASSERT_EQ(Ok, list->add(item));
-  }
-  std::vector<unsigned char> bytes = bytesOf(*list);
-  EXPECT_EQ(4u + 3u * 3u, bytes.size()) << "count, then each record without type id";
-  SharedPointer<gom::ObjectCollection<Inner>> back = gom::ObjectCollection<Inner>::create();
-  ASSERT_TRUE(readFrom(*back, bytes));
-  EXPECT_TRUE(*list == *back);
-  bytes[0] = 200;  // more items claimed than present
-  SharedPointer<gom::ObjectCollection<Inner>> shortList = gom::ObjectCollection<Inner>::create();
-  EXPECT_FALSE(readFrom(*shortList, bytes));
-}

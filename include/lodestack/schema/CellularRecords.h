@@ -111,12 +111,11 @@ class LODESTACK_EXPORT ServingCellMeasurementRecord : public Record<Self, TypeId
 
   bool valueExists(Mask mask) const {
     return Table::valueExists(static_cast<Mask>(mask & ~kViaBits)) &&
-           (true && ... && (!(mask & Vias::bit) || nwHas<Vias::nwField>()));
+           (true && ... && viaExists<Vias>(mask));
   }
   void unset(Mask mask) {
     Table::unset(static_cast<Mask>(mask & ~kViaBits));
-    const gom::SharedPointer<Nw>& nw = nwMeasurement();
-    if (nw) (..., (mask & Vias::bit ? nw->unset(Nw::Table::template bitOf<Vias::nwField>()) : void()));
+    (unsetVia<Vias>(mask), ...);
   }
 
   const gom::SharedPointer<Nw>& nwMeasurement() const { return this->template field<kNwField>(); }
@@ -129,10 +128,17 @@ class LODESTACK_EXPORT ServingCellMeasurementRecord : public Record<Self, TypeId
   template <std::size_t NwField>
   using ViaType = typename Nw::Table::template TypeAt<NwField>;
 
-  template <std::size_t NwField>
-  bool nwHas() const {
+  // One delegated property V: present unless `mask` names it and the
+  // network measurement lacks it; unset there when `mask` names it.
+  template <class V>
+  bool viaExists(Mask mask) const {
     const gom::SharedPointer<Nw>& nw = nwMeasurement();
-    return nw && nw->valueExists(Nw::Table::template bitOf<NwField>());
+    return !(mask & V::bit) || (nw && nw->valueExists(Nw::Table::template bitOf<V::nwField>()));
+  }
+  template <class V>
+  void unsetVia(Mask mask) {
+    const gom::SharedPointer<Nw>& nw = nwMeasurement();
+    if ((mask & V::bit) && nw) nw->unset(Nw::Table::template bitOf<V::nwField>());
   }
   template <std::size_t NwField>
   ViaType<NwField> via() const {
