@@ -21,7 +21,8 @@ class LODESTACK_EXPORT ShapeMatrix : public Symmetric2by2Matrix {
   ShapeMatrix() = default;
   ShapeMatrix(double latitudeVariance, double covariance, double longitudeVariance)
       : Symmetric2by2Matrix(latitudeVariance, covariance, longitudeVariance) {}
-  ShapeMatrix(const Symmetric2by2Matrix& matrix) : Symmetric2by2Matrix(matrix) {}  // NOLINT
+  // Implicit on purpose: the sums and products of the base convert back.
+  ShapeMatrix(const Symmetric2by2Matrix& matrix) : Symmetric2by2Matrix(matrix) {}
 
   // Makes this matrix the covariance of an ellipse with semi-axes
   // `semiMajor` and `semiMinor` metres whose major axis points `angle`
