@@ -4,6 +4,7 @@
 
 #include <cstdlib>
 #include <fstream>
+#include <iterator>
 #include <string>
 
 #include "schema/SampleRecords.h"
@@ -237,23 +238,32 @@ TEST(Cellular, CellsAndNeighbours) {
   EXPECT_TRUE(back->currentNeighbors().empty()) << "a failed read leaves the cell cleared";
 }
 
-// With LODESTACK_WRITE_FUZZ_SEEDS=<dir>, writes the object-reader seeds:
-// every record in a code-14 variant, all of them in one generic object, and
-// a full container. The first byte selects the reader (0 object, 1 variant).
-TEST(Cellular, WriteFuzzSeeds) {
-  const char* dir = std::getenv("LODESTACK_WRITE_FUZZ_SEEDS");
-  if (!dir) GTEST_SKIP() << "set LODESTACK_WRITE_FUZZ_SEEDS to write the seeds";
-  auto save = [dir](const std::string& name, unsigned char selector, const ISerializable& s) {
+// The object reader's fuzz seeds double as the pinned byte format of every
+// record: each checked-in seed must be exactly what the records write now.
+// With LODESTACK_WRITE_FUZZ_SEEDS=<dir> the seeds are written there instead
+// (after a deliberate format change).
+TEST(Cellular, FuzzSeedsPinTheByteFormat) {
+  const char* target = std::getenv("LODESTACK_WRITE_FUZZ_SEEDS");
+  const std::string dir = target ? target : LODESTACK_SOURCE_DIR "/fuzz/corpus/object_reader";
+  auto check = [&](const std::string& name, unsigned char selector, const ISerializable& s) {
     std::vector<unsigned char> bytes = bytesOf(s);
-    std::ofstream out(std::string(dir) + "/" + name, std::ios::binary);
-    out.put(static_cast<char>(selector));
-    out.write(reinterpret_cast<const char*>(bytes.data()), static_cast<std::streamsize>(bytes.size()));
+    bytes.insert(bytes.begin(), selector);
+    const std::string path = dir + "/" + name;
+    if (target) {
+      std::ofstream out(path, std::ios::binary);
+      out.write(reinterpret_cast<const char*>(bytes.data()), static_cast<std::streamsize>(bytes.size()));
+      return;
+    }
+    std::ifstream in(path, std::ios::binary);
+    const std::vector<unsigned char> pinned((std::istreambuf_iterator<char>(in)),
+                                            std::istreambuf_iterator<char>());
+    EXPECT_EQ(pinned, bytes) << name << " no longer matches " << path;
   };
   for (const SharedPointer<gom::ObjectBase>& r : sample::allRecords()) {
     gom::Variant v(7);
     ASSERT_EQ(Ok, v.setObjectValue(r));
-    save("record_" + std::to_string(r->key()), 1, v);
+    check("record_" + std::to_string(r->key()), 1, v);
   }
-  save("all_records", 0, *objectOfAllRecords());
-  save("measurement_container", 0, *sample::fullContainer());
+  check("all_records", 0, *objectOfAllRecords());
+  check("measurement_container", 0, *sample::fullContainer());
 }
