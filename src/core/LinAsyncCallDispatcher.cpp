@@ -1,5 +1,6 @@
 #include "lodestack/core/LinAsyncCallDispatcher.h"
 
+#include <errno.h>
 #include <sys/socket.h>
 #include <unistd.h>
 
@@ -38,15 +39,19 @@ bool LinAsyncCallDispatcher::baseInit() {
 }
 
 bool LinAsyncCallDispatcher::sendId(unsigned int id) {
-  return send(writeFd_, &id, sizeof id, MSG_DONTWAIT | MSG_EOR) == sizeof id;
+  if (send(writeFd_, &id, sizeof id, MSG_DONTWAIT | MSG_EOR) == sizeof id) return true;
+  // A full pair is the normal case: records are waiting, and the owner sends
+  // one waiting id per record it consumes. Any other failure may leave the
+  // pair empty, so the waiting ids are retried from every sleep and queueing.
+  if (errno != EAGAIN && errno != EWOULDBLOCK) stalled_.store(true, std::memory_order_relaxed);
+  return false;
 }
 
-// Lock held (we are called from addDelegate). While earlier ids wait to be
-// sent, the pair is full and records are on their way to the owner, who
-// sends the waiting ids after consuming each record; this id joins the end
-// of the queue so that records always travel in id order.
+// Lock held (we are called from addDelegate). While earlier ids wait, this
+// one joins the end of the queue, so records always travel in id order.
 bool LinAsyncCallDispatcher::doScheduleDelegate(unsigned int id) {
   if (writeFd_ == 0) return false;
+  if (stalled_.load(std::memory_order_relaxed)) flushUnsentLocked();
   if (unsent_.empty() && sendId(id)) return true;
   unsent_.push_back(id);
   hasUnsent_.store(true, std::memory_order_relaxed);
@@ -54,13 +59,11 @@ bool LinAsyncCallDispatcher::doScheduleDelegate(unsigned int id) {
 }
 
 void LinAsyncCallDispatcher::flushUnsentLocked() {
+  stalled_.store(false, std::memory_order_relaxed);
   while (!unsent_.empty() && sendId(unsent_.front())) unsent_.pop_front();
   hasUnsent_.store(!unsent_.empty(), std::memory_order_relaxed);
-  stalled_.store(false, std::memory_order_relaxed);
 }
 
-// Only needed when a resend failed for another reason than a full pair
-// (see duringTake); then the pair may have run dry with ids still waiting.
 void LinAsyncCallDispatcher::resendUnsent() {
   if (!stalled_.load(std::memory_order_relaxed)) return;
   ScopedLock lock(pendingLock());
@@ -77,17 +80,12 @@ void LinAsyncCallDispatcher::invokeApc() {
   invokeDelegate(id);
 }
 
-// The record just consumed made room for exactly one more, and producers
-// send nothing while ids wait: send the oldest waiting id. A failure here
-// cannot be for lack of room, so the next sleep retries them all.
+// The record just consumed made room for one more, and producers send
+// nothing while ids wait: send the oldest waiting id.
 void LinAsyncCallDispatcher::duringTake() {
   if (!hasUnsent_.load(std::memory_order_relaxed) || unsent_.empty()) return;
-  if (sendId(unsent_.front())) {
-    unsent_.pop_front();
-    hasUnsent_.store(!unsent_.empty(), std::memory_order_relaxed);
-  } else {
-    stalled_.store(true, std::memory_order_relaxed);
-  }
+  if (sendId(unsent_.front())) unsent_.pop_front();
+  hasUnsent_.store(!unsent_.empty(), std::memory_order_relaxed);
 }
 
 bool LinAsyncCallDispatcher::attachPollSink(const pollfd& p, IPollSink* sink) {

@@ -55,8 +55,8 @@ class LODESTACK_EXPORT LinAsyncCallDispatcher : public AsyncCallDispatcherCommon
   // Calls the sink of the descriptor of `p`: false when there is none or it
   // threw, true otherwise.
   bool invokeCallback(const pollfd& p);
-  // Retries remembered ids after a failed resend (owning thread, before
-  // waiting; takes the lock only then).
+  // Retries remembered ids after a send failed for another reason than a
+  // full pair (owning thread, before waiting; takes the lock only then).
   void resendUnsent();
   // The wake-up socket is read without blocking: it needs no second look
   // before its sink is called.
@@ -74,7 +74,7 @@ class LODESTACK_EXPORT LinAsyncCallDispatcher : public AsyncCallDispatcherCommon
   std::map<int, IPollSink*> sinks_;  // owning thread only
   std::deque<unsigned int> unsent_;  // guarded by pendingLock()
   std::atomic<bool> hasUnsent_;      // a hint readable without the lock
-  std::atomic<bool> stalled_;        // a resend failed: retry from sleep
+  std::atomic<bool> stalled_;        // a send failed on a pair not full
 };
 
 }  // namespace core
