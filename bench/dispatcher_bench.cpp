@@ -6,10 +6,15 @@
 //   - latency: queueing to execution of one call into an idle loop (median
 //     and 99th percentile);
 //   - burst: 100,000 calls queued while the loop is not reading, then the
-//     time the loop needs to run them all.
+//     time the loop needs to run them all;
+//   - the wake-up primitives alone: a socket-pair record against an eventfd.
 #include <glib.h>
+#include <sys/eventfd.h>
+#include <sys/socket.h>
+#include <unistd.h>
 
 #include <atomic>
+#include <cstdint>
 #include <condition_variable>
 #include <cstdio>
 #include <map>
@@ -241,6 +246,33 @@ void BM_Burst100k(benchmark::State& state) {
   gFigures[key(kind, "100k burst queue ms")] = queueMs;
   gFigures[key(kind, "100k burst drain ms")] = drainMs;
 }
+
+// The wake-up primitives alone, one thread, no waiting: a 4-byte record
+// through a SOCK_SEQPACKET pair (what each queued call costs the
+// dispatchers) against an eventfd write and read (what GLib's wake-up costs).
+void BM_SeqpacketRecord(benchmark::State& state) {
+  int fds[2];
+  if (socketpair(AF_UNIX, SOCK_SEQPACKET, 0, fds) != 0) return state.SkipWithError("socketpair");
+  unsigned int id = 1;
+  for (auto _ : state) {
+    send(fds[1], &id, sizeof id, MSG_DONTWAIT | MSG_EOR);
+    recv(fds[0], &id, sizeof id, MSG_DONTWAIT);
+  }
+  close(fds[0]);
+  close(fds[1]);
+}
+BENCHMARK(BM_SeqpacketRecord);
+
+void BM_EventfdWakeup(benchmark::State& state) {
+  const int fd = eventfd(0, EFD_NONBLOCK);
+  uint64_t value = 1;
+  for (auto _ : state) {
+    (void)!write(fd, &value, sizeof value);
+    (void)!read(fd, &value, sizeof value);
+  }
+  close(fd);
+}
+BENCHMARK(BM_EventfdWakeup);
 
 void kinds(benchmark::internal::Benchmark* b) {
   b->Arg(kPoll)->Arg(kGlib)->Arg(kGlibInvoke)->Iterations(1)->UseManualTime()->Unit(
