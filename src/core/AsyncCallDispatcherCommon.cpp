@@ -41,12 +41,7 @@ void AsyncCallDispatcherCommon::removeAllAsyncCall(IAsyncCallReceiver* receiver)
 }
 
 bool AsyncCallDispatcherCommon::doQueueAsyncCall(const Delegate& delegate) {
-  try {
-    addDelegate(delegate);
-    return true;
-  } catch (...) {
-    return false;
-  }
+  return guardedCall([&] { addDelegate(delegate); });
 }
 
 void AsyncCallDispatcherCommon::addDelegate(const Delegate& delegate) {

@@ -1,4 +1,4 @@
-// Runs a user callback, discarding what it throws.
+// Runs a callback (or a step that may throw), discarding what it throws.
 #ifndef LODESTACK_SRC_CORE_GUARDEDCALL_H
 #define LODESTACK_SRC_CORE_GUARDEDCALL_H
 
