@@ -1,55 +1,36 @@
 // Runs every file of the given directories (or the given files) once through
 // the fuzz entry point, as libFuzzer would, and reports how many ran.
-#include <dirent.h>
-#include <sys/stat.h>
-
 #include <cstdint>
 #include <cstdio>
+#include <filesystem>
 #include <fstream>
 #include <iterator>
-#include <string>
 #include <vector>
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size);
 
-namespace {
-
-int runFile(const std::string& path) {
-  std::ifstream in(path, std::ios::binary);
-  if (!in) {
-    std::fprintf(stderr, "cannot open %s\n", path.c_str());
-    return 1;
-  }
-  std::vector<char> bytes((std::istreambuf_iterator<char>(in)), std::istreambuf_iterator<char>());
-  LLVMFuzzerTestOneInput(reinterpret_cast<const uint8_t*>(bytes.data()), bytes.size());
-  return 0;
-}
-
-}  // namespace
-
 int main(int argc, char** argv) {
-  int files = 0;
-  int failures = 0;
+  namespace fs = std::filesystem;
+  std::vector<fs::path> inputs;
   for (int i = 1; i < argc; ++i) {
-    struct stat st;
-    if (stat(argv[i], &st) != 0) {
-      std::fprintf(stderr, "no such path: %s\n", argv[i]);
-      return 1;
+    if (!fs::is_directory(argv[i])) {
+      inputs.push_back(argv[i]);
+      continue;
     }
-    if (S_ISDIR(st.st_mode)) {
-      DIR* dir = opendir(argv[i]);
-      if (!dir) return 1;
-      while (dirent* entry = readdir(dir)) {
-        if (entry->d_name[0] == '.') continue;
-        failures += runFile(std::string(argv[i]) + "/" + entry->d_name);
-        ++files;
-      }
-      closedir(dir);
-    } else {
-      failures += runFile(argv[i]);
-      ++files;
-    }
+    for (const fs::directory_entry& entry : fs::directory_iterator(argv[i]))
+      if (entry.path().filename().string()[0] != '.') inputs.push_back(entry.path());
   }
-  std::printf("replayed %d inputs\n", files);
-  return failures == 0 && files > 0 ? 0 : 1;
+  int failures = 0;
+  for (const fs::path& path : inputs) {
+    std::ifstream in(path, std::ios::binary);
+    if (!in) {
+      std::fprintf(stderr, "cannot open %s\n", path.c_str());
+      ++failures;
+      continue;
+    }
+    std::vector<char> bytes((std::istreambuf_iterator<char>(in)), std::istreambuf_iterator<char>());
+    LLVMFuzzerTestOneInput(reinterpret_cast<const uint8_t*>(bytes.data()), bytes.size());
+  }
+  std::printf("replayed %zu inputs\n", inputs.size());
+  return failures == 0 && !inputs.empty() ? 0 : 1;
 }

@@ -8,6 +8,7 @@
 #include <string>
 
 #include "schema/SampleRecords.h"
+#include "schema/SchemaTestSupport.h"
 
 using namespace lodestack;
 using namespace lodestack::schema;
@@ -15,18 +16,11 @@ using gom::SharedPointer;
 
 namespace {
 
-std::vector<unsigned char> bytesOf(const ISerializable& s) {
-  BufferStream out;
-  EXPECT_TRUE(s.write(out));
-  const Buffer& b = out.buffer();
-  return std::vector<unsigned char>(b.data(), b.data() + b.size());
-}
-
 template <class R>
-std::vector<unsigned char> bytesAfterVersion(const SharedPointer<R>& r) {
-  std::vector<unsigned char> b = bytesOf(*r);
+Bytes bytesAfterVersion(const SharedPointer<R>& r) {
+  Bytes b = bytesOf(*r);
   EXPECT_EQ(1, b.at(0)) << "version byte";
-  return std::vector<unsigned char>(b.begin() + 1, b.end());
+  return Bytes(b.begin() + 1, b.end());
 }
 
 // A generic object holding every record as a code-14 property.
@@ -40,49 +34,36 @@ SharedPointer<gom::GenericObject> objectOfAllRecords() {
 
 }  // namespace
 
-TEST(Cellular, FactoryIds) {
-  for (unsigned short id : {0, 99, 136}) {
-    EXPECT_FALSE(ObjectBaseFactory::createObject(id)) << id;
-  }
-  unsigned int known = 0;
+TEST(Cellular, FactoryAndEveryRecordInsideAGenericObject) {
+  for (unsigned short id : {0, 99, 136}) EXPECT_FALSE(ObjectBaseFactory::createObject(id)) << id;
+  SharedPointer<gom::GenericObject> o = objectOfAllRecords();
+  const Bytes bytes = bytesOf(*o);
+  SharedPointer<gom::GenericObject> back = gom::GenericObject::create(1);
+  ASSERT_TRUE(readFrom(*back, bytes));
+  EXPECT_TRUE(*back == *o);
   for (const SharedPointer<gom::ObjectBase>& r : sample::allRecords()) {
     SharedPointer<gom::ObjectBase> empty = ObjectBaseFactory::createObject(r->key());
     ASSERT_TRUE(empty) << r->key();
-    EXPECT_EQ(r->key(), empty->key());
-    EXPECT_TRUE(typeid(*empty) == typeid(*r)) << r->key();
-    ++known;
-  }
-  EXPECT_EQ(32u, known);
-}
-
-TEST(Cellular, EveryRecordTravelsInsideAGenericObject) {
-  SharedPointer<gom::GenericObject> o = objectOfAllRecords();
-  std::vector<unsigned char> bytes = bytesOf(*o);
-  BufferStream in(bytes.data(), static_cast<unsigned int>(bytes.size()));
-  SharedPointer<gom::GenericObject> back = gom::GenericObject::create(in);
-  ASSERT_TRUE(back);
-  EXPECT_TRUE(*back == *o);
-  for (const SharedPointer<gom::ObjectBase>& r : sample::allRecords()) {
+    EXPECT_TRUE(empty->key() == r->key() && typeid(*empty) == typeid(*r)) << r->key();
     SharedPointer<gom::ObjectBase> read;
     ASSERT_EQ(Ok, back->getObjectProperty(r->key(), read));
     EXPECT_TRUE(read->compare(r.get())) << r->key();
     SharedPointer<gom::ObjectBase> clone = r->clone();
     EXPECT_TRUE(clone && clone->compare(r.get())) << r->key();
   }
+  EXPECT_EQ(32u, sample::allRecords().size());
   // Cut anywhere, the object does not read.
   for (std::size_t n = 0; n < bytes.size(); n += 7) {
-    BufferStream cut(bytes.data(), static_cast<unsigned int>(n));
-    EXPECT_FALSE(gom::GenericObject::create(cut)) << n;
+    EXPECT_FALSE(readFrom(*back, Bytes(bytes.begin(), bytes.begin() + n))) << n;
   }
 }
 
 TEST(Cellular, FullContainerRoundTrip) {
   SharedPointer<MeasurementContainer> c = sample::fullContainer();
   EXPECT_TRUE(c->valueExists(0x7F));
-  std::vector<unsigned char> bytes = bytesOf(*c);
-  BufferStream in(bytes.data(), static_cast<unsigned int>(bytes.size()));
-  SharedPointer<MeasurementContainer> back =
-      MeasurementContainer::create(gom::GenericObject::create(in));
+  SharedPointer<gom::GenericObject> o = gom::GenericObject::create(1);
+  ASSERT_TRUE(readFrom(*o, bytesOf(*c)));
+  SharedPointer<MeasurementContainer> back = MeasurementContainer::create(o);
   ASSERT_TRUE(back);
   EXPECT_TRUE(*back == *c);
   SharedPointer<UtraFddCellMeasurement> fdd =
@@ -90,7 +71,6 @@ TEST(Cellular, FullContainerRoundTrip) {
   ASSERT_TRUE(fdd);
   EXPECT_EQ(1699999990u, fdd->unreliableStateTimeStamp());
   EXPECT_EQ(3u, fdd->nwMeasurementCollection()->size());
-  EXPECT_TRUE(*fdd->dn() == *sample::full<UtraCellDn>());
   EXPECT_FALSE(UtraFddCellMeasurement::create(back->utraTddMeasurement(0)))
       << "the type id of the wrapped object is checked";
 }
@@ -99,13 +79,13 @@ TEST(Cellular, MasksAndWidths) {
   // GERAN: timing advance 8 bits; UTRA-TDD and E-UTRA: 16 bits.
   SharedPointer<GeranServingCellMeasurement> geran = GeranServingCellMeasurement::create();
   geran->setTimingAdvance(0x12);
-  EXPECT_EQ((std::vector<unsigned char>{2, 0x12}), bytesAfterVersion(geran));
+  EXPECT_EQ((Bytes{2, 0x12}), bytesAfterVersion(geran));
   SharedPointer<UtraTddServingCellMeasurement> tdd = UtraTddServingCellMeasurement::create();
   tdd->setTimingAdvance(0x1234);
-  EXPECT_EQ((std::vector<unsigned char>{4, 0x34, 0x12}), bytesAfterVersion(tdd));
+  EXPECT_EQ((Bytes{4, 0x34, 0x12}), bytesAfterVersion(tdd));
   SharedPointer<EUtraServingCellMeasurement> eutra = EUtraServingCellMeasurement::create();
   eutra->setTimingAdvance(0x1234);
-  EXPECT_EQ((std::vector<unsigned char>{2, 0x34, 0x12}), bytesAfterVersion(eutra));
+  EXPECT_EQ((Bytes{2, 0x34, 0x12}), bytesAfterVersion(eutra));
 
   // UTRA-FDD serving: nwMeasurement on bit 128; rscp is signed.
   SharedPointer<UtraFddServingCellMeasurement> fdd = UtraFddServingCellMeasurement::create();
@@ -113,14 +93,10 @@ TEST(Cellular, MasksAndWidths) {
   ASSERT_EQ(Ok, fdd->setUarfcnUl(0x0A0B));
   fdd->nwMeasurement()->setRscp(-5);
   EXPECT_EQ(0x81, fdd->presenceMask());
-  EXPECT_EQ((std::vector<unsigned char>{0x81, 0x02, 0x01, 1, 2 | 32, 0x0B, 0x0A, 0xFB}),
-            bytesAfterVersion(fdd));
+  EXPECT_EQ((Bytes{0x81, 0x02, 0x01, 1, 2 | 32, 0x0B, 0x0A, 0xFB}), bytesAfterVersion(fdd));
   EXPECT_EQ(-5, fdd->nwMeasurement()->rscp());
 
   // UTRA ucid split and merge; the merge does not mask the RNC id.
-  SharedPointer<UtraCellDn> utra = UtraCellDn::create(244, 5, UtraCellDn::mergeUcid(300, 17));
-  EXPECT_EQ(300, utra->rncId());
-  EXPECT_EQ(17, utra->cid());
   EXPECT_EQ(0x12340011u, UtraCellDn::mergeUcid(0x1234, 0x11));
   unsigned short rnc = 0, cid = 0;
   UtraCellDn::splitUcid(0x12340011u, rnc, cid);
@@ -132,16 +108,14 @@ TEST(Cellular, MasksAndWidths) {
   EXPECT_EQ(0x123456789u & 0xFFFFFFFFu, EUtraCellDn::mergeUcid(0x1234567, 0x89));
 
   // CDMA frequency infos carry nothing and always compare equal.
-  EXPECT_EQ((std::vector<unsigned char>{0}), bytesAfterVersion(CdmaFrequencyInfo::create()));
+  EXPECT_EQ((Bytes{0}), bytesAfterVersion(CdmaFrequencyInfo::create()));
   EXPECT_TRUE(*CdmaFrequencyInfo::create() == *CdmaFrequencyInfo::create());
 }
 
 TEST(Cellular, DelegatedProperties) {
   SharedPointer<GeranServingCellMeasurement> s = GeranServingCellMeasurement::create();
   EXPECT_FALSE(s->valueExists(1));
-  EXPECT_EQ(0, s->rxLevel());
   ASSERT_EQ(Ok, s->setRxLevel(40));
-  ASSERT_TRUE(s->nwMeasurement());
   EXPECT_EQ(40, s->nwMeasurement()->rxLevel());
   EXPECT_EQ(8, s->nwMeasurement()->presenceMask());
   EXPECT_TRUE(s->valueExists(1 | 16));
@@ -149,7 +123,6 @@ TEST(Cellular, DelegatedProperties) {
   EXPECT_FALSE(s->valueExists(4)) << "the network measurement lacks frequencyInfo";
   ASSERT_EQ(Ok, s->setFrequencyInfo(GeranFrequencyInfo::create(3, 700)));
   EXPECT_TRUE(s->valueExists(1 | 4 | 16));
-  EXPECT_EQ(700, s->frequencyInfo()->arfcn());
   s->unset(1);
   EXPECT_FALSE(s->nwMeasurement()->valueExists(8));
 
@@ -164,18 +137,15 @@ TEST(Cellular, DelegatedProperties) {
   EXPECT_FALSE(*copy == *s);
 
   // The other families delegate frequencyInfo on their own bits.
-  SharedPointer<CdmaServingCellMeasurement> cdma = CdmaServingCellMeasurement::create();
-  cdma->setFrequencyInfo(CdmaFrequencyInfo::create());
-  EXPECT_EQ(2, cdma->presenceMask());
-  EXPECT_TRUE(cdma->valueExists(1 | 2));
-  SharedPointer<EUtraServingCellMeasurement> eutra = EUtraServingCellMeasurement::create();
-  eutra->setFrequencyInfo(EUtraFrequencyInfo::create(6300, 12));
-  EXPECT_EQ(1, eutra->presenceMask());
-  EXPECT_TRUE(eutra->valueExists(1 | 4));
-  SharedPointer<UtraTddServingCellMeasurement> tdd = UtraTddServingCellMeasurement::create();
-  tdd->setFrequencyInfo(UtraTddFrequencyInfo::create(10055, 7));
-  EXPECT_EQ(8, tdd->presenceMask());
-  EXPECT_TRUE(tdd->valueExists(2 | 8));
+  auto delegates = [](auto m, auto info, unsigned int ownMask, unsigned int present) {
+    m->setFrequencyInfo(info);
+    EXPECT_EQ(ownMask, m->presenceMask()) << "type " << m->key();
+    EXPECT_TRUE(m->valueExists(present)) << "type " << m->key();
+  };
+  delegates(CdmaServingCellMeasurement::create(), CdmaFrequencyInfo::create(), 2, 1 | 2);
+  delegates(EUtraServingCellMeasurement::create(), EUtraFrequencyInfo::create(6300, 12), 1, 1 | 4);
+  delegates(UtraTddServingCellMeasurement::create(), UtraTddFrequencyInfo::create(10055, 7), 8,
+            2 | 8);
 }
 
 TEST(Cellular, CellMeasurementsAcceptTheirOwnNetworkMeasurements) {
@@ -217,23 +187,13 @@ TEST(Cellular, CellsAndNeighbours) {
   copy->neighbors().removeAt(1);
   EXPECT_FALSE(*copy == *cell);
 
-  // A neighbour: coverage and frequencyInfo by content.
-  SharedPointer<GeranNeighborCell> a = GeranNeighborCell::create(GeranFrequencyInfo::create(1, 2));
-  SharedPointer<GeranNeighborCell> b = GeranNeighborCell::create(GeranFrequencyInfo::create(1, 2));
-  EXPECT_TRUE(*a == *b);
-  a->setCoverage(Area::create(1, 2, 30, 20, 45.0f));
-  EXPECT_FALSE(*a == *b);
-  b->setCoverage(Area::create(1, 2, 30, 20, 45.0f));
-  EXPECT_TRUE(*a == *b);
-
   // The neighbour list travels after the cell's own fields.
-  std::vector<unsigned char> bytes = bytesOf(*cell);
+  Bytes bytes = bytesOf(*cell);
   SharedPointer<GeranCell> back = GeranCell::create();
-  BufferStream in(bytes.data(), static_cast<unsigned int>(bytes.size()));
-  ASSERT_TRUE(back->read(in));
+  ASSERT_TRUE(readFrom(*back, bytes));
   EXPECT_TRUE(*back == *cell);
-  BufferStream cut(bytes.data(), static_cast<unsigned int>(bytes.size() - 1));
-  EXPECT_FALSE(back->read(cut));
+  bytes.pop_back();
+  EXPECT_FALSE(readFrom(*back, bytes));
   EXPECT_EQ(0, back->presenceMask());
   EXPECT_TRUE(back->currentNeighbors().empty()) << "a failed read leaves the cell cleared";
 }
@@ -246,7 +206,7 @@ TEST(Cellular, FuzzSeedsPinTheByteFormat) {
   const char* target = std::getenv("LODESTACK_WRITE_FUZZ_SEEDS");
   const std::string dir = target ? target : LODESTACK_SOURCE_DIR "/fuzz/corpus/object_reader";
   auto check = [&](const std::string& name, unsigned char selector, const ISerializable& s) {
-    std::vector<unsigned char> bytes = bytesOf(s);
+    Bytes bytes = bytesOf(s);
     bytes.insert(bytes.begin(), selector);
     const std::string path = dir + "/" + name;
     if (target) {
@@ -255,8 +215,7 @@ TEST(Cellular, FuzzSeedsPinTheByteFormat) {
       return;
     }
     std::ifstream in(path, std::ios::binary);
-    const std::vector<unsigned char> pinned((std::istreambuf_iterator<char>(in)),
-                                            std::istreambuf_iterator<char>());
+    const Bytes pinned((std::istreambuf_iterator<char>(in)), std::istreambuf_iterator<char>());
     EXPECT_EQ(pinned, bytes) << name << " no longer matches " << path;
   };
   for (const SharedPointer<gom::ObjectBase>& r : sample::allRecords()) {

@@ -1,43 +1,24 @@
-#include <gtest/gtest.h>
-
-#include <lodestack/lodestack.h>
+// The typed wrapper of a generic object and the collection helpers.
+#include "schema/SchemaTestSupport.h"
 
 using namespace lodestack;
 using namespace lodestack::schema;
 using gom::SharedPointer;
 
 TEST(GenericObjectWrapper, TypedAccessThrows) {
-  EXPECT_THROW(
-      {
-        try {
-          GenericObjectWrapper::create(SharedPointer<gom::GenericObject>());
-        } catch (Status s) {
-          EXPECT_EQ(WrongObjectType, s);
-          throw;
-        }
-      },
-      Status);
+  EXPECT_EQ(WrongObjectType,
+            thrownBy([] { GenericObjectWrapper::create(SharedPointer<gom::GenericObject>()); }));
 
   SharedPointer<GenericObjectWrapper> w = GenericObjectWrapper::create(9);
   ASSERT_TRUE(w);
   EXPECT_EQ(9, w->key());
   int v = 0;
-  try {
-    w->getProperty(1, v, "v");
-    ADD_FAILURE() << "a missing property must throw";
-  } catch (Status s) {
-    EXPECT_EQ(NotFound, s);
-  }
+  EXPECT_EQ(NotFound, thrownBy([&] { w->getProperty(1, v, "v"); })) << "a missing property";
   w->setProperty(1, 42, "v");
   w->getProperty(1, v, "v");
   EXPECT_EQ(42, v);
   unsigned char wrongKind = 0;
-  try {
-    w->getProperty(1, wrongKind, "v");
-    ADD_FAILURE() << "a kind mismatch must throw";
-  } catch (Status s) {
-    EXPECT_EQ(Refused, s);
-  }
+  EXPECT_EQ(Refused, thrownBy([&] { w->getProperty(1, wrongKind, "v"); })) << "a kind mismatch";
 
   // Shares the object; clone() is a deep copy of it.
   SharedPointer<GenericObjectWrapper> shared = GenericObjectWrapper::create(w->wrappedObject());
