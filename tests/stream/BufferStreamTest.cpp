@@ -147,18 +147,11 @@ TEST(BufferStream, TypedOperationsAreLittleEndianImages) {
   EXPECT_EQ(u64, 0x1122334455667788ull);
   EXPECT_EQ(f, 1.0f);
   EXPECT_EQ(d, -2.0);
-  ASSERT_TRUE(s.readUint16(u16));
-  EXPECT_EQ(static_cast<short>(u16), -2);
-  EXPECT_TRUE(s.eof());
-}
 
-TEST(BufferStream, ShortReadFailsTheTypedRead) {
-  const unsigned char three[] = {1, 2, 3};
-  BufferStream s(three, 3);
-  unsigned int v = 0xFFFFFFFF;
-  EXPECT_FALSE(s.readUint32(v));
-  EXPECT_TRUE(s.eof()) << "the three bytes were consumed";
-  EXPECT_EQ(s.offset(), 3u);
+  // A short read fails the typed read but consumes what was there.
+  EXPECT_FALSE(s.readUint32(u32)) << "two bytes left";
+  EXPECT_TRUE(s.eof());
+  EXPECT_EQ(s.offset(), 28u);
 }
 
 }  // namespace
