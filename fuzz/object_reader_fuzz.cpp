@@ -12,36 +12,25 @@ using namespace lodestack::gom;
 
 namespace {
 
-bool hasKeyZero(const Variant& v);
-
 // An object of key 0 reads back from its own bytes differently on purpose
 // (the reader stops after the key), so trees holding one skip the round trip.
-bool hasKeyZero(const GenericObject& object) {
-  if (object.key() == 0) return true;
-  for (const InternalVariant& p : object.properties())
-    if (hasKeyZero(p)) return true;
-  return false;
-}
-
-bool hasKeyZero(const ValueCollection& collection) {
-  for (const Variant* item : collection)
-    if (hasKeyZero(*item)) return true;
-  return false;
-}
-
-bool hasKeyZero(const CharacterData&) { return false; }
-
 bool hasKeyZero(const Variant& v) {
   SharedPointer<GenericObject> object;
   SharedPointer<ValueCollection> collection;
-  if (v.getGenericObjectValue(object) == Ok && object) return hasKeyZero(*object);
-  if (v.getCollectionValue(collection) == Ok && collection) return hasKeyZero(*collection);
+  if (v.getGenericObjectValue(object) == Ok && object) {
+    if (object->key() == 0) return true;
+    for (const InternalVariant& p : object->properties())
+      if (hasKeyZero(p)) return true;
+  } else if (v.getCollectionValue(collection) == Ok && collection) {
+    for (const Variant* item : *collection)
+      if (hasKeyZero(*item)) return true;
+  }
   return false;
 }
 
+// Writes `first`, reads the bytes into `second` and requires equality.
 template <class T>
 void checkRoundTrip(const T& first, T& second) {
-  if (hasKeyZero(first)) return;
   BufferStream out;
   if (!first.write(out)) std::abort();
   BufferStream in(out.buffer());
@@ -54,6 +43,7 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
   if (size < 1) return 0;
   const unsigned char selector = data[0] % 4;
   BufferStream stream(data + 1, static_cast<unsigned int>(size - 1));
+  Variant holder;  // the value read, for the key-0 check
   switch (selector) {
     case 0: {
       SharedPointer<GenericObject> object = GenericObject::create(stream);
@@ -61,7 +51,8 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
       SharedPointer<GenericObject> clone = object->clone();
       if (!clone || !(*clone == *object)) std::abort();
       SharedPointer<GenericObject> back = GenericObject::create(1);
-      checkRoundTrip(*object, *back);
+      if (holder.setGenericObjectValue(object) == Ok && !hasKeyZero(holder))
+        checkRoundTrip(*object, *back);
       break;
     }
     case 1: {
@@ -71,14 +62,15 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
       if (!clone || !(*clone == v)) std::abort();
       delete clone;
       Variant back;
-      checkRoundTrip(v, back);
+      if (!hasKeyZero(v)) checkRoundTrip(v, back);
       break;
     }
     case 2: {
       SharedPointer<ValueCollection> collection = ValueCollection::create();
       if (!collection->read(stream)) break;
       SharedPointer<ValueCollection> back = ValueCollection::create();
-      checkRoundTrip(*collection, *back);
+      if (holder.setCollectionValue(collection) == Ok && !hasKeyZero(holder))
+        checkRoundTrip(*collection, *back);
       break;
     }
     default: {

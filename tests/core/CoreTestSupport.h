@@ -38,7 +38,6 @@ class FunctionThread : public IThreadObserver {
     if (thread_) thread_->wait();
   }
   IThread& thread() { return *thread_; }
-  bool valid() const { return bool(thread_); }
   void threadMain() override { body_(); }
 
  private:

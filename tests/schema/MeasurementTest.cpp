@@ -9,20 +9,17 @@ namespace {
 
 class TestDn : public Record<TestDn, 7101, FieldTable<unsigned char, Field<unsigned short, 1>>> {};
 class TestNw : public Record<TestNw, 7102, FieldTable<unsigned char, Field<unsigned char, 1>>> {};
-class OtherNw : public Record<OtherNw, 7103, FieldTable<unsigned char, Field<unsigned char, 1>>> {};
 class TestServing
     : public Record<TestServing, 7104, FieldTable<unsigned char, Field<unsigned char, 1>>> {};
 
-template <bool Unreliable>
 struct TestTraits {
   using Base = Measurement<TestDn, 2>;
   using ServingCellMeasurement = TestServing;
   using NwMeasurement = TestNw;
   static constexpr unsigned short kTypeId = 2;
-  static constexpr bool kUnreliableState = Unreliable;
+  static constexpr bool kUnreliableState = false;
 };
-using TestMeasurement = CellMeasurement<TestTraits<false>>;
-using UtraLikeMeasurement = CellMeasurement<TestTraits<true>>;
+using TestMeasurement = CellMeasurement<TestTraits>;
 
 // Exposes the layer below for its own checks.
 class PlainMeasurement : public Measurement<TestDn, 2> {
@@ -45,7 +42,6 @@ TEST(Measurement, FlagsAndLayers) {
   m->setServingCellMeasurement(TestServing::create());
   ASSERT_EQ(Ok, m->addNwMeasurement(TestNw::create()));
   EXPECT_TRUE(m->valueExists(0xF));
-  EXPECT_EQ(Refused, m->addNwMeasurement(OtherNw::create()));
   EXPECT_EQ(Refused, m->addNwMeasurement(SharedPointer<TestNw>()));
   EXPECT_EQ(1u, m->nwMeasurementCollection()->size());
 
@@ -57,13 +53,6 @@ TEST(Measurement, FlagsAndLayers) {
   EXPECT_EQ(0u, m->wrappedObject()->propertyCount());
   EXPECT_FALSE(m->dn());
   EXPECT_FALSE(m->servingCellMeasurement());
-
-  SharedPointer<UtraLikeMeasurement> u = UtraLikeMeasurement::create();
-  EXPECT_FALSE(u->valueExists(0x10));
-  u->setUnreliableStateTimeStamp(77);
-  EXPECT_TRUE(u->valueExists(0x10));
-  EXPECT_FALSE(u->valueExists(0x20));
-  EXPECT_TRUE(u->wrappedObject()->propertyExists(207));
 
   // Creation from an object checks its key; the lower layers' getters throw.
   EXPECT_FALSE(TestMeasurement::create(gom::GenericObject::create(3)));
