@@ -8,8 +8,7 @@
 #include "lodestack/core/ITimer.h"
 #include "lodestack/core/LinGlibAsyncCallDispatcher.h"
 
-namespace lodestack {
-namespace core {
+namespace lodestack::core {
 namespace {
 
 using gom::SharedPointer;
@@ -111,5 +110,4 @@ TEST(GlibDispatcher, DetachInsideADispatchIsDeferred) {
 }
 
 }  // namespace
-}  // namespace core
-}  // namespace lodestack
+}  // namespace lodestack::core

@@ -9,8 +9,7 @@
 #include "lodestack/core/ISemaphore.h"
 #include "lodestack/core/Lockable.h"
 
-namespace lodestack {
-namespace core {
+namespace lodestack::core {
 namespace {
 
 using gom::SharedPointer;
@@ -99,5 +98,4 @@ TEST(Lockable, DepthAndUnmatchedUnlock) {
 }
 
 }  // namespace
-}  // namespace core
-}  // namespace lodestack
+}  // namespace lodestack::core

@@ -8,8 +8,7 @@
 #include "lodestack/core/ITimer.h"
 #include "lodestack/core/Status.h"
 
-namespace lodestack {
-namespace core {
+namespace lodestack::core {
 namespace {
 
 using gom::SharedPointer;
@@ -75,5 +74,4 @@ TEST_F(TimerTest, ABurstAfterAStallIsCappedAt256) {
 }
 
 }  // namespace
-}  // namespace core
-}  // namespace lodestack
+}  // namespace lodestack::core

@@ -8,8 +8,7 @@
 #include "lodestack/gom/ValueCollection.h"
 #include "lodestack/stream/BufferStream.h"
 
-namespace lodestack {
-namespace gom {
+namespace lodestack::gom {
 namespace {
 
 using Bytes = std::vector<unsigned char>;
@@ -205,5 +204,4 @@ TEST(GenericObject, NestingIsBounded) {
 }
 
 }  // namespace
-}  // namespace gom
-}  // namespace lodestack
+}  // namespace lodestack::gom

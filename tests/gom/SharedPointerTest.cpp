@@ -2,8 +2,7 @@
 
 #include "lodestack/gom/SharedPointer.h"
 
-namespace lodestack {
-namespace gom {
+namespace lodestack::gom {
 namespace {
 
 struct Probe : ReferenceCountable {
@@ -57,5 +56,4 @@ TEST(SharedPointer, ConvertsUpAndCastsDown) {
 }
 
 }  // namespace
-}  // namespace gom
-}  // namespace lodestack
+}  // namespace lodestack::gom

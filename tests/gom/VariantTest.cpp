@@ -8,8 +8,7 @@
 #include "lodestack/gom/ValueCollection.h"
 #include "lodestack/stream/BufferStream.h"
 
-namespace lodestack {
-namespace gom {
+namespace lodestack::gom {
 namespace {
 
 TEST(Variant, NeverChangesKind) {
@@ -134,5 +133,4 @@ TEST(CharacterData, EmptyFromTextDiffersFromEmptyFromBytes) {
 }
 
 }  // namespace
-}  // namespace gom
-}  // namespace lodestack
+}  // namespace lodestack::gom
