@@ -18,6 +18,9 @@
 
 namespace lodestack {
 namespace core {
+
+using gom::SharedPointer;
+
 namespace testing {
 
 // Chooses the test thread's loop type for one scope.

@@ -14,7 +14,6 @@
 namespace lodestack::core {
 namespace {
 
-using gom::SharedPointer;
 using namespace testing;
 using Type = AsyncCallDispatcher::MainLoopType;
 

@@ -11,7 +11,6 @@
 namespace lodestack::core {
 namespace {
 
-using gom::SharedPointer;
 using namespace testing;
 
 struct LoopState {

@@ -12,7 +12,6 @@
 namespace lodestack::core {
 namespace {
 
-using gom::SharedPointer;
 using namespace testing;
 using Clock = std::chrono::steady_clock;
 

@@ -11,9 +11,7 @@
 namespace lodestack::core {
 namespace {
 
-using gom::SharedPointer;
-using testing::LoopTypeScope;
-using testing::runUntil;
+using namespace testing;
 
 struct CountingObserver : ITimerObserver {
   int calls = 0;

@@ -3,9 +3,6 @@
 
 #include "schema/SchemaTestSupport.h"
 
-using namespace lodestack;
-using namespace lodestack::schema;
-using gom::SharedPointer;
 using Dn = CellularObjectDn;
 
 TEST(CellularObjectDn, Factories) {

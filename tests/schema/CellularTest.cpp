@@ -10,10 +10,6 @@
 #include "schema/SampleRecords.h"
 #include "schema/SchemaTestSupport.h"
 
-using namespace lodestack;
-using namespace lodestack::schema;
-using gom::SharedPointer;
-
 namespace {
 
 template <class R>

@@ -1,10 +1,6 @@
 // The typed wrapper of a generic object and the collection helpers.
 #include "schema/SchemaTestSupport.h"
 
-using namespace lodestack;
-using namespace lodestack::schema;
-using gom::SharedPointer;
-
 TEST(GenericObjectWrapper, TypedAccessThrows) {
   EXPECT_EQ(WrongObjectType,
             thrownBy([] { GenericObjectWrapper::create(SharedPointer<gom::GenericObject>()); }));

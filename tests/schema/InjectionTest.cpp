@@ -1,10 +1,6 @@
 // Cell, cellular object and GNSS injections and the Injection bag.
 #include "schema/SchemaTestSupport.h"
 
-using namespace lodestack;
-using namespace lodestack::schema;
-using gom::SharedPointer;
-
 TEST(Injection, ServingAndNeighbourCellInjections) {
   SharedPointer<GeranServingCellInjection> s =
       GeranServingCellInjection::create(GeranCellDn::create(244, 5, 100, 200), 77);

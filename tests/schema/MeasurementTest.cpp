@@ -1,10 +1,6 @@
 // The measurement layers and the container, over records made for the test.
 #include "schema/SchemaTestSupport.h"
 
-using namespace lodestack;
-using namespace lodestack::schema;
-using gom::SharedPointer;
-
 namespace {
 
 class TestDn : public Record<TestDn, 7101, FieldTable<unsigned char, Field<unsigned short, 1>>> {};

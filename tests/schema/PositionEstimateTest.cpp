@@ -3,10 +3,6 @@
 
 #include "schema/SchemaTestSupport.h"
 
-using namespace lodestack;
-using namespace lodestack::schema;
-using gom::SharedPointer;
-
 namespace {
 const double kNaN = std::numeric_limits<double>::quiet_NaN();
 }  // namespace

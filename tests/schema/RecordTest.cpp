@@ -3,10 +3,6 @@
 
 #include "schema/SchemaTestSupport.h"
 
-using namespace lodestack;
-using namespace lodestack::schema;
-using gom::SharedPointer;
-
 namespace {
 
 class Inner : public Record<Inner, 7001,

@@ -1,4 +1,5 @@
-// Byte and exception helpers shared by the schema tests.
+// Byte and exception helpers shared by the schema tests, which all use the
+// library's names unqualified.
 #ifndef LODESTACK_TESTS_SCHEMA_SCHEMATESTSUPPORT_H
 #define LODESTACK_TESTS_SCHEMA_SCHEMATESTSUPPORT_H
 
@@ -8,30 +9,33 @@
 
 #include <lodestack/lodestack.h>
 
+using namespace lodestack;
+using namespace lodestack::schema;
+using gom::SharedPointer;
 using Bytes = std::vector<unsigned char>;
 
 // What `s` writes; a failed write is a test failure.
-inline Bytes bytesOf(const lodestack::ISerializable& s) {
-  lodestack::BufferStream out;
+inline Bytes bytesOf(const ISerializable& s) {
+  BufferStream out;
   EXPECT_TRUE(s.write(out));
-  const lodestack::Buffer& b = out.buffer();
+  const Buffer& b = out.buffer();
   return Bytes(b.data(), b.data() + b.size());
 }
 
-inline bool readFrom(lodestack::ISerializable& s, const Bytes& bytes) {
-  lodestack::BufferStream in(bytes.data(), static_cast<unsigned int>(bytes.size()));
+inline bool readFrom(ISerializable& s, const Bytes& bytes) {
+  BufferStream in(bytes.data(), static_cast<unsigned int>(bytes.size()));
   return s.read(in);
 }
 
 // The Status `f` throws, or Ok when it returns.
 template <class F>
-lodestack::Status thrownBy(F f) {
+Status thrownBy(F f) {
   try {
     f();
-  } catch (lodestack::Status s) {
+  } catch (Status s) {
     return s;
   }
-  return lodestack::Ok;
+  return Ok;
 }
 
 #endif  // LODESTACK_TESTS_SCHEMA_SCHEMATESTSUPPORT_H

@@ -1,10 +1,6 @@
 // WLAN records and measurement, and the trimming of WLAN collections.
 #include "schema/SchemaTestSupport.h"
 
-using namespace lodestack;
-using namespace lodestack::schema;
-using gom::SharedPointer;
-
 TEST(Wlan, BssidForms) {
   SharedPointer<WlanDn> dn = WlanDn::create();
   unsigned int length = 99;
