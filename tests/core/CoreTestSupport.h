@@ -8,7 +8,9 @@
 
 #include <chrono>
 #include <functional>
+#include <thread>
 #include <utility>
+#include <vector>
 
 #include "lodestack/core/AsyncCallDispatcher.h"
 #include "lodestack/core/IAsyncCallDispatcher.h"
@@ -60,6 +62,21 @@ inline bool runUntil(IAsyncCallDispatcher& dispatcher, const std::function<bool(
   while (!done() && secondsSince(start) < limitSeconds) dispatcher.sleep(100);
   return done();
 }
+
+// The calls in the order they ran, and whether all ran on the owner.
+struct CallLog {
+  std::vector<long> calls;
+  std::thread::id owner = std::this_thread::get_id();
+  bool allOnOwner = true;
+  void record(long value) {
+    allOnOwner = allOnOwner && std::this_thread::get_id() == owner;
+    calls.push_back(value);
+  }
+};
+inline CallLog* gLog = nullptr;  // the test's log; owner thread only
+
+inline void* asParam(long value) { return reinterpret_cast<void*>(value); }
+inline void logCall(void* param) { gLog->record(reinterpret_cast<long>(param)); }
 
 // Counts its calls, reads one byte (if any) and runs an optional action.
 struct CountingSink : IPollSink {

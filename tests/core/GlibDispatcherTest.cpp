@@ -1,9 +1,6 @@
 #include <glib.h>
 #include <gtest/gtest.h>
 
-#include <thread>
-#include <vector>
-
 #include "core/CoreTestSupport.h"
 #include "lodestack/core/ITimer.h"
 #include "lodestack/core/LinGlibAsyncCallDispatcher.h"
@@ -13,20 +10,13 @@ namespace {
 
 using namespace testing;
 
-struct LoopState {
+struct LoopState : CallLog {
   GMainLoop* loop = nullptr;
   IAsyncCallDispatcher* dispatcher = nullptr;
-  std::vector<long> calls;
-  std::thread::id owner = std::this_thread::get_id();
-  bool allOnOwner = true;
   int ticks = 0;
 };
 LoopState* gState = nullptr;
 
-void recordCall(void* param) {
-  gState->allOnOwner = gState->allOnOwner && std::this_thread::get_id() == gState->owner;
-  gState->calls.push_back(reinterpret_cast<long>(param));
-}
 void quitLoop(void*) { g_main_loop_quit(gState->loop); }
 
 // Ticks three times, then stops and queues the call that quits the loop.
@@ -43,6 +33,7 @@ struct Ticker : ITimerObserver {
 TEST(GlibDispatcher, RunsInsideAnApplicationsMainLoop) {
   LoopState state;
   gState = &state;
+  gLog = &state;
   SharedPointer<IAsyncCallDispatcher> dispatcher =
       AsyncCallDispatcher::openDispatcher(AsyncCallDispatcher::MainLoopGlib);
   ASSERT_TRUE(dispatcher);
@@ -52,7 +43,7 @@ TEST(GlibDispatcher, RunsInsideAnApplicationsMainLoop) {
   ASSERT_TRUE(timer) << "the timer joins the thread's GLib dispatcher";
 
   FunctionThread producer([&] {
-    for (long i = 0; i < 500; ++i) state.dispatcher->queueAsyncCall(&recordCall, (void*)i);
+    for (long i = 0; i < 500; ++i) state.dispatcher->queueAsyncCall(&logCall, asParam(i));
   });
   ASSERT_TRUE(producer.thread().wait());
   ASSERT_EQ(timer->start(20, 0), 0);
@@ -75,6 +66,7 @@ TEST(GlibDispatcher, RunsInsideAnApplicationsMainLoop) {
   for (long i = 0; i < 500; ++i) ASSERT_EQ(state.calls[i], i);
   EXPECT_TRUE(state.allOnOwner);
   gState = nullptr;
+  gLog = nullptr;
 }
 
 TEST(GlibDispatcher, DetachInsideADispatchIsDeferred) {

@@ -7,7 +7,6 @@ TEST(Injection, ServingAndNeighbourCellInjections) {
   ASSERT_TRUE(s);
   EXPECT_EQ(s->key(), 6);
   EXPECT_TRUE(s->valueExists(0x3));
-  EXPECT_FALSE(s->valueExists(0x4));
   EXPECT_FALSE(s->valueExists(0x40)) << "outside the flags";
   EXPECT_FALSE(s->coverage()) << "absent reads empty";
   s->setCoverage(Area::create(1, 2, 30u, 20u, 45.0f));

@@ -44,10 +44,6 @@ struct Filler<ServingCell<Traits>> {
     for (int i = 0; i < 2; ++i) cell.neighbors().add(full<typename Traits::NeighborCell>());
   }
 };
-template <>
-struct Filler<CellularObjectDn> {
-  static void fill(CellularObjectDn&) {}
-};
 
 template <class R>
 SharedPointer<R> full() {
