@@ -1,6 +1,6 @@
-# Every exported, defined symbol belongs to namespace lodestack (or is one of
-# the C++ runtime's weak template instantiations such as std:: or typeinfo
-# of the public classes).
+# Every exported, defined symbol belongs to namespace lodestack, or is one
+# of the C++ library's weak template instantiations (std::, with or without a
+# return type in front), or a linker or sanitizer symbol.
 execute_process(COMMAND nm -DC --defined-only ${LIBRARY}
   OUTPUT_VARIABLE symbols RESULT_VARIABLE rc)
 if(NOT rc EQUAL 0)
@@ -16,7 +16,9 @@ foreach(line ${lines})
     if(name MATCHES "lodestack::(detail|internal)::")
       list(APPEND bad "${name}")
     endif()
-  elseif(name MATCHES "^(std::|__gnu_cxx::|operator new|operator delete|_init$|_fini$|__bss_start|_edata|_end$|__odr_asan|__asan|__ubsan|__sanitizer|__lsan|__tsan)")
+  elseif(name MATCHES "(^|[ *&])(std|__gnu_cxx)::" OR
+         name MATCHES "^(operator new|operator delete|_init$|_fini$|__bss_start|_edata|_end$|__odr_asan|__asan|__ubsan|__sanitizer|__lsan|__tsan)")
+    # The C++ library's own weak template instantiations; not ours to hide.
   elseif(name MATCHES "^(typeinfo|vtable|VTT|guard variable)")
   else()
     list(APPEND bad "${name}")
