@@ -14,7 +14,7 @@ struct DerivedProbe : Probe {
   using Probe::Probe;
 };
 
-TEST(SharedPointer, CountsHandlesAndDestroysAtZero) {
+TEST(SharedPointer, CountsConvertsAndCasts) {
   int destroyed = 0;
   SharedPointer<Probe> a(new Probe(&destroyed));
   EXPECT_EQ(a->referenceCount(), 1);
@@ -34,10 +34,8 @@ TEST(SharedPointer, CountsHandlesAndDestroysAtZero) {
 
   a.clear();  // on null: nothing
   EXPECT_TRUE(a.isNull());
-}
 
-TEST(SharedPointer, ConvertsUpAndCastsDown) {
-  int destroyed = 0;
+  destroyed = 0;
   SharedPointer<DerivedProbe> derived(new DerivedProbe(&destroyed));
   SharedPointer<Probe> base = derived;
   EXPECT_EQ(base->referenceCount(), 2);

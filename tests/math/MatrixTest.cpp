@@ -76,9 +76,8 @@ TEST(Matrix4, LayoutInverseAndDiagonal) {
         ASSERT_NEAR(sum * scale[j] / scale[i], i == j ? 1.0 : 0.0, 1e-9) << trial;
       }
   }
-}
 
-TEST(Matrix4, StateCovarianceLoadsThePositionBlock) {
+  // The state covariance loads a shape matrix into its position block only.
   StateEstimateCovariance c(1.0, 2.0, 3.0);
   EXPECT_EQ(c, Symmetric4by4Matrix(1, 2, 3, 0, 0, 0, 0, 0, 0, 0));
   c += Symmetric4by4Matrix(0, 0, 0, 0, 0, 0, 0, 5, 6, 7);

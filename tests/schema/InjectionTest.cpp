@@ -1,7 +1,7 @@
 // Cell, cellular object and GNSS injections and the Injection bag.
 #include "schema/SchemaTestSupport.h"
 
-TEST(Injection, ServingAndNeighbourCellInjections) {
+TEST(Injection, CellAndCellularObjectInjections) {
   SharedPointer<GeranServingCellInjection> s =
       GeranServingCellInjection::create(GeranCellDn::create(244, 5, 100, 200), 77);
   ASSERT_TRUE(s);
@@ -32,9 +32,7 @@ TEST(Injection, ServingAndNeighbourCellInjections) {
   EXPECT_EQ(CdmaNeighborCellInjection::create()->key(), 19);
   EXPECT_TRUE(GeranServingCellInjection::create(s->wrappedObject()));
   EXPECT_FALSE(UtraFddServingCellInjection::create(s->wrappedObject()));
-}
 
-TEST(Injection, CellularObjectInjection) {
   EXPECT_EQ(CellularObjectInjection::create()->timeStamp(), 0u) << "absent reads 0";
   SharedPointer<CellularObjectInjection> c = CellularObjectInjection::create(
       CellularObjectDn::create(), 55, Area::create(Coverage(3, 4, 10.0f)));

@@ -7,7 +7,7 @@ namespace {
 const double kNaN = std::numeric_limits<double>::quiet_NaN();
 }  // namespace
 
-TEST(PositionEstimate, SettersEnforceTheirRanges) {
+TEST(PositionEstimate, SettersRangesAndIntegerViews) {
   PositionEstimate p;
   struct Case {
     Status (PositionEstimate::*setter)(double);
@@ -37,12 +37,9 @@ TEST(PositionEstimate, SettersEnforceTheirRanges) {
   EXPECT_EQ(p.setTimeStamp(0), InvalidArgument);
   EXPECT_FALSE(p.valueExists(PositionEstimate::TimeStamp));
   EXPECT_EQ(p.latitude(), -90.0) << "the last accepted value";
-}
+  EXPECT_EQ(thrownBy([&] { (void)p.minorAxis(); }), WrongObjectType) << "absent minorAxis";
 
-TEST(PositionEstimate, GettersThrowAndIntegerViews) {
-  PositionEstimate p;
-  EXPECT_EQ(thrownBy([&] { (void)p.latitude(); }), WrongObjectType);
-
+  // The integer views truncate.
   EXPECT_EQ(p.setAltitudeAccuracy(0), InvalidArgument);
   EXPECT_EQ(p.setAltitudeAccuracy(7), Ok);
   EXPECT_EQ(p.altitudeUncertainty(), 7.0);
