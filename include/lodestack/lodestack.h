@@ -68,4 +68,7 @@
 #include "lodestack/math/Symmetric2by2Matrix.h"
 #include "lodestack/math/Symmetric4by4Matrix.h"
 
+// debug
+#include "lodestack/debug/Debug.h"
+
 #endif  // LODESTACK_LODESTACK_H
