@@ -3,6 +3,7 @@
 #ifndef LODESTACK_BENCH_RATIO_REPORTER_H
 #define LODESTACK_BENCH_RATIO_REPORTER_H
 
+#include <algorithm>
 #include <cstdio>
 #include <map>
 #include <string>
@@ -22,8 +23,15 @@ class RatioReporter : public benchmark::ConsoleReporter {
 
   void ReportRuns(const std::vector<Run>& runs) override {
     for (const Run& run : runs) {
-      if (run.run_type == Run::RT_Iteration && !run.error_occurred)
-        nanos_[run.benchmark_name()] = run.GetAdjustedCPUTime();
+      if (run.error_occurred) continue;
+      // Under --benchmark_repetitions a benchmark reports one run per
+      // repetition and then its aggregates; the median stands for it, and
+      // the repetitions' own median when only those reach the reporter.
+      const std::string name = run.run_name.str();
+      if (run.run_type == Run::RT_Iteration)
+        samples_[name].push_back(run.GetAdjustedCPUTime());
+      else if (run.aggregate_name == "median")
+        medians_[name] = run.GetAdjustedCPUTime();
     }
     ConsoleReporter::ReportRuns(runs);
   }
@@ -32,13 +40,13 @@ class RatioReporter : public benchmark::ConsoleReporter {
     ConsoleReporter::Finalize();
     std::printf("\nratios measured in this run:\n");
     for (const Pair& p : pairs_) {
-      auto a = nanos_.find(p.name);
-      auto b = nanos_.find(p.reference);
-      if (a == nanos_.end() || b == nanos_.end() || b->second <= 0) {
+      const double a = nanos(p.name);
+      const double b = nanos(p.reference);
+      if (a <= 0 || b <= 0) {
         std::printf("  %-40s / %-32s  (not measured)\n", p.name.c_str(), p.reference.c_str());
         continue;
       }
-      const double ratio = a->second / b->second;
+      const double ratio = a / b;
       std::printf("  %-40s / %-32s = %6.2f  (target <= %.1f: %s)\n", p.name.c_str(),
                   p.reference.c_str(), ratio, p.target, ratio <= p.target ? "met" : "MISSED");
     }
@@ -50,8 +58,20 @@ class RatioReporter : public benchmark::ConsoleReporter {
     std::string reference;
     double target;
   };
+  // CPU nanoseconds per iteration of `name`; 0 when it did not run.
+  double nanos(const std::string& name) const {
+    auto median = medians_.find(name);
+    if (median != medians_.end()) return median->second;
+    auto samples = samples_.find(name);
+    if (samples == samples_.end() || samples->second.empty()) return 0;
+    std::vector<double> sorted = samples->second;
+    std::sort(sorted.begin(), sorted.end());
+    return sorted[sorted.size() / 2];
+  }
+
   std::vector<Pair> pairs_;
-  std::map<std::string, double> nanos_;
+  std::map<std::string, std::vector<double>> samples_;
+  std::map<std::string, double> medians_;
 };
 
 }  // namespace lodestack_bench
