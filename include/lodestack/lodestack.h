@@ -25,6 +25,7 @@
 #include "lodestack/gom/GenericObject.h"
 #include "lodestack/gom/ObjectBase.h"
 #include "lodestack/gom/ObjectCollection.h"
+#include "lodestack/gom/RecordFactory.h"
 #include "lodestack/gom/ReferenceCountable.h"
 #include "lodestack/gom/SharedPointer.h"
 #include "lodestack/gom/ValueCollection.h"
@@ -61,12 +62,25 @@
 #include "lodestack/schema/utility/Utility.h"
 
 // math
+#include "lodestack/math/EllipseMath.h"
 #include "lodestack/math/Midpoint.h"
 #include "lodestack/math/ShapeMatrix.h"
 #include "lodestack/math/StateEstimate.h"
 #include "lodestack/math/StateEstimateCovariance.h"
 #include "lodestack/math/Symmetric2by2Matrix.h"
 #include "lodestack/math/Symmetric4by4Matrix.h"
+
+// radioadaptation
+#include "lodestack/radioadaptation/IRadioAdaptation.h"
+#include "lodestack/radioadaptation/IRadioAdaptationObserver.h"
+#include "lodestack/radioadaptation/MeasurementTracing.h"
+#include "lodestack/radioadaptation/RadioAdaptationCommon.h"
+
+// measurements
+#include "lodestack/measurements/IMeasurementsObserver.h"
+#include "lodestack/measurements/ISimulationDataProvider.h"
+#include "lodestack/measurements/MeasurementsProvider.h"
+#include "lodestack/measurements/MeasurementsValidator.h"
 
 // debug
 #include "lodestack/debug/Debug.h"

@@ -1,6 +1,6 @@
 #include "lodestack/gom/ObjectBase.h"
 
-#include "gom/RecordFactory.h"
+#include "lodestack/gom/RecordFactory.h"
 
 namespace lodestack {
 namespace gom {
@@ -9,9 +9,10 @@ namespace {
 RecordFactoryFunction recordFactory = nullptr;
 }  // namespace
 
-bool installRecordFactory(RecordFactoryFunction factory) {
+RecordFactoryFunction installRecordFactory(RecordFactoryFunction factory) {
+  RecordFactoryFunction previous = recordFactory;
   recordFactory = factory;
-  return true;
+  return previous;
 }
 
 SharedPointer<ObjectBase> createRecord(unsigned short typeId) {

@@ -5,7 +5,7 @@
 #include <new>
 
 #include "gom/NestingGuard.h"
-#include "gom/RecordFactory.h"
+#include "lodestack/gom/RecordFactory.h"
 #include "lodestack/gom/CharacterData.h"
 #include "lodestack/gom/GenericObject.h"
 #include "lodestack/gom/ObjectBase.h"

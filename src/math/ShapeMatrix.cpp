@@ -5,8 +5,8 @@
 #include "lodestack/math/Midpoint.h"
 #include "lodestack/math/StateEstimate.h"
 #include "lodestack/math/StateEstimateCovariance.h"
+#include "lodestack/math/EllipseMath.h"
 #include "lodestack/schema/utility/Utility.h"
-#include "math/EllipseMath.h"
 
 namespace lodestack {
 

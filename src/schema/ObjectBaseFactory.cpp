@@ -1,6 +1,6 @@
 #include "lodestack/schema/ObjectBaseFactory.h"
 
-#include "gom/RecordFactory.h"
+#include "lodestack/gom/RecordFactory.h"
 #include "lodestack/schema/Area.h"
 #include "lodestack/schema/Cdma.h"
 #include "lodestack/schema/CellularObject.h"
@@ -96,7 +96,8 @@ gom::SharedPointer<gom::ObjectBase> ObjectBaseFactory::createObject(unsigned sho
 
 namespace {
 // The object model reads code-14 variants through this factory.
-[[maybe_unused]] const bool registered = gom::installRecordFactory(&ObjectBaseFactory::createObject);
+[[maybe_unused]] const bool registered =
+    (gom::installRecordFactory(&ObjectBaseFactory::createObject), true);
 }  // namespace
 
 }  // namespace schema

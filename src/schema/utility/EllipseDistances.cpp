@@ -4,8 +4,8 @@
 
 #include "lodestack/math/Midpoint.h"
 #include "lodestack/math/ShapeMatrix.h"
+#include "lodestack/math/EllipseMath.h"
 #include "lodestack/schema/utility/Utility.h"
-#include "math/EllipseMath.h"
 
 namespace lodestack {
 namespace schema {

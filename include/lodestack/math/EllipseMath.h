@@ -1,11 +1,13 @@
-// Helpers of the ellipse computations (ShapeMatrix, schema::Utility).
+// EllipseMath: small helpers of the uncertainty-ellipse computations, shared
+// by ShapeMatrix and the ellipse distances of schema::Utility. Header-only,
+// pure functions; any thread.
 //
 // Symmetric2by2Matrix::invmat refuses determinants below an absolute bound
 // of 1e-19, which covariances in degrees^2 of ellipses a few metres across
 // fall under. Here a matrix is singular only when its determinant vanishes
 // to working precision relative to the size of its elements.
-#ifndef LODESTACK_SRC_MATH_ELLIPSEMATH_H
-#define LODESTACK_SRC_MATH_ELLIPSEMATH_H
+#ifndef LODESTACK_MATH_ELLIPSEMATH_H
+#define LODESTACK_MATH_ELLIPSEMATH_H
 
 #include <cfloat>
 #include <cmath>
@@ -37,4 +39,4 @@ inline double wrapLongitudeDifference(double degrees) {
 
 }  // namespace lodestack
 
-#endif  // LODESTACK_SRC_MATH_ELLIPSEMATH_H
+#endif  // LODESTACK_MATH_ELLIPSEMATH_H
