@@ -70,10 +70,16 @@
 #include "lodestack/math/Symmetric2by2Matrix.h"
 #include "lodestack/math/Symmetric4by4Matrix.h"
 
+// platform: the interfaces lodestack runs on, implemented by the host build
+#include "lodestack/platform/HostPlatform.h"
+#include "lodestack/platform/LocationManager.h"
+#include "lodestack/platform/RadioMeasurements.h"
+
 // radioadaptation
 #include "lodestack/radioadaptation/IRadioAdaptation.h"
 #include "lodestack/radioadaptation/IRadioAdaptationObserver.h"
 #include "lodestack/radioadaptation/MeasurementTracing.h"
+#include "lodestack/radioadaptation/RadioAdaptationFactory.h"
 #include "lodestack/radioadaptation/RadioAdaptationCommon.h"
 
 // measurements
