@@ -76,9 +76,13 @@
 #include "lodestack/platform/RadioMeasurements.h"
 
 // radioadaptation
+#include "lodestack/radioadaptation/ConverterOxel.h"
+#include "lodestack/radioadaptation/FreeGnssListener.h"
 #include "lodestack/radioadaptation/IRadioAdaptation.h"
 #include "lodestack/radioadaptation/IRadioAdaptationObserver.h"
+#include "lodestack/radioadaptation/LinuxRadioAdaptationOxel.h"
 #include "lodestack/radioadaptation/MeasurementTracing.h"
+#include "lodestack/radioadaptation/MeasurementTracingOxel.h"
 #include "lodestack/radioadaptation/RadioAdaptationFactory.h"
 #include "lodestack/radioadaptation/RadioAdaptationCommon.h"
 

@@ -89,6 +89,7 @@ class LODESTACK_EXPORT RadioAdaptationCommon : public IRadioAdaptation, public c
                                                                     Status& status);
   virtual int doParseNetworkStatus(const void* data, MeasurementType type, Status& status);
 
+  bool hasObserver() const { return observer != nullptr; }
   // `types` when it names exactly one kind, else 0.
   static int verifyMeasurementTypes(int types);
   Status startCancelTimer(MeasurementType type);

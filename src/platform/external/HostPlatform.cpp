@@ -1,0 +1,15 @@
+// A device's platform has no scenarios: the host platform's report
+// functions exist so that clients build the same way on both.
+#include "lodestack/platform/HostPlatform.h"
+
+namespace lodestack {
+namespace platform {
+
+std::string lastError() { return std::string(); }
+
+std::string checkScenarioFile(const std::string& path) {
+  return "scenario " + path + ": scenarios are replayed by the host platform only";
+}
+
+}  // namespace platform
+}  // namespace lodestack
