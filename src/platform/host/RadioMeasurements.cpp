@@ -35,7 +35,7 @@ struct PendingMeasurement : lodestack::core::ITimerObserver {
       case Answer::Never:
         return;
       case Answer::Synchronous:
-        cb(ctx, result.build(std::time(nullptr)));
+        cb(ctx, result.build(std::time(nullptr), std::time(nullptr)));
         return;
       case Answer::Delayed:
         break;
@@ -47,6 +47,7 @@ struct PendingMeasurement : lodestack::core::ITimerObserver {
     callback = cb;
     context = ctx;
     pending = &result;
+    started = std::time(nullptr);
     // A timer cannot expire at once: no delay still answers from the loop.
     if (timer->start(std::max(answer.delayMs, 1), 0, 0) != lodestack::Ok) {
       callback = nullptr;
@@ -65,7 +66,7 @@ struct PendingMeasurement : lodestack::core::ITimerObserver {
     RadioMeasurements::Callback cb = callback;
     callback = nullptr;
     // Last: the callback may destroy the library object.
-    cb(context, pending->build(std::time(nullptr)));
+    cb(context, pending->build(started, std::time(nullptr)));
   }
 
   const Kind& kind;
@@ -73,6 +74,7 @@ struct PendingMeasurement : lodestack::core::ITimerObserver {
   RadioMeasurements::Callback callback = nullptr;
   void* context = nullptr;
   const Result* pending = nullptr;
+  std::time_t started = 0;
   SharedPointer<lodestack::core::ITimer> timer;
 };
 

@@ -12,6 +12,8 @@
 
 #include <nlohmann/json.hpp>
 
+#include "lodestack/platform/HostPlatform.h"
+
 namespace lodestack {
 namespace platform {
 namespace host {
@@ -356,10 +358,17 @@ std::string gLastError;
 
 }  // namespace
 
-OxelMeasurements Result::build(std::time_t now) const {
+OxelMeasurements Result::build(std::time_t started, std::time_t now) const {
   OxelMeasurements m;
   m.setCellUnreliableState(unreliableState);
-  m.setCellDchTimestamp(dchTimestamp);
+  if (dchTimestamp)
+    m.setCellDchTimestamp(*dchTimestamp);
+  else if (dchStateDuration == -2)
+    m.setCellDchTimestamp(0);
+  else if (dchStateDuration == -1)
+    m.setCellDchTimestamp(-1);
+  else
+    m.setCellDchTimestamp(static_cast<long>(started) - dchStateDuration);
   for (const ElementTemplate& t : elements) {
     std::shared_ptr<OxelObservationElement> e = std::visit(
         [](const auto& value) -> std::shared_ptr<OxelObservationElement> {

@@ -51,13 +51,15 @@ struct ElementTemplate {
 struct Result {
   std::optional<Answer> answer;  // the kind's answer when unset
   int unreliableState = 0;
-  long dchTimestamp = 0;
   int dchStateDuration = -2;  // what the modem reports when this result's request starts
+  // When the dedicated-channel state began, as the result reports it; when
+  // the scenario does not say, it follows from dchStateDuration at the start.
+  std::optional<long> dchTimestamp;
   std::vector<ElementTemplate> elements;
 
-  // The result as the library hands it over, stamped with `now` where the
-  // scenario gave no time.
-  OxelMeasurements build(std::time_t now) const;
+  // The result of a measurement started at `started`, handed over at `now`:
+  // elements stamped with `now` where the scenario gave no time.
+  OxelMeasurements build(std::time_t started, std::time_t now) const;
 };
 
 struct Kind {
