@@ -1,7 +1,8 @@
 // What the host platform tells its clients beyond the platform interfaces.
 //
 // The host platform is configured by the environment, read when its objects
-// are made: LODESTACK_SCENARIO names the scenario file (JSON, see
+// are made (the measurement library with the adaptation, the location
+// manager when GNSS is first subscribed): LODESTACK_SCENARIO names the scenario file (JSON, see
 // doc/scenarios.md; the built-in street when unset), LODESTACK_GNSS the
 // location source (see LocationManager.h). When a platform object cannot be
 // made, for example because the scenario file does not load, lastError()
