@@ -5,8 +5,13 @@
 // same run, on the same dispatcher: one bare dispatcher round trip (queue a
 // call, run it) and the validation of the container alone, which together
 // are the least a result can cost; and pushMeasurement throughput beside the
-// dispatcher's own calls per second. Both dispatcher kinds.
+// dispatcher's own calls per second. Both dispatcher kinds. Last, the whole
+// platform path: the factory's adaptation over the host platform replaying
+// the built-in street with every answer given inside the start call.
 #include <cstdio>
+#include <cstdlib>
+#include <fstream>
+#include <sstream>
 #include <map>
 #include <string>
 #include <vector>
@@ -195,6 +200,54 @@ void BM_BareCallThroughput(benchmark::State& state) {
 }
 BENCHMARK(BM_BareCallThroughput)->Arg(kPoll)->Arg(kGlib)->Unit(benchmark::kMillisecond);
 
+// The street scenario with every answer given at once, in a temporary file.
+std::string instantStreet() {
+  std::ifstream in(LODESTACK_STREET_SCENARIO);
+  std::stringstream text;
+  text << in.rdbuf();
+  std::string json = text.str();
+  const std::string delayed = "\"answer\": \"delayed\"";
+  for (std::size_t at = json.find(delayed); at != std::string::npos; at = json.find(delayed))
+    json.replace(at, delayed.size(), "\"answer\": \"synchronous\"");
+  const std::string path = "/tmp/lodestack-bench-street.json";
+  std::ofstream(path) << json;
+  return path;
+}
+
+// requestMeasurements to measurementsReady through the factory's adaptation;
+// range(0) the kind, range(1) the measured kind (1 cellular, 2 WLAN).
+void BM_ScenarioRequestToObserver(benchmark::State& state) {
+  const Kind kind = static_cast<Kind>(state.range(0));
+  const int type = static_cast<int>(state.range(1));
+  LoopScope scope(kind);
+  setenv("LODESTACK_SCENARIO", instantStreet().c_str(), 1);
+  radioadaptation::IRadioAdaptation* radio =
+      radioadaptation::RadioAdaptationFactory::createRadioAdaptation();
+  if (!radio) {
+    state.SkipWithError(lodestack::platform::lastError().c_str());
+    return;
+  }
+  MeasurementsProvider* provider = MeasurementsProvider::create(*radio);
+  CountingObserver observer;
+  provider->addObserver(observer, type);
+  std::vector<double> samples;
+  for (auto _ : state) {
+    const double start = nowMicros();
+    unsigned int id;
+    if (provider->requestMeasurements(type, id) != Ok) {
+      state.SkipWithError("request refused");
+      break;
+    }
+    runUntil(*scope.dispatcher, observer.results, observer.results + 1);
+    samples.push_back(nowMicros() - start);
+  }
+  delete provider;
+  delete radio;
+  unsetenv("LODESTACK_SCENARIO");
+  record(std::string(kKindNames[kind]) + (type == 1 ? " street cellular" : " street wlan"), samples);
+}
+BENCHMARK(BM_ScenarioRequestToObserver)->ArgsProduct({{kPoll, kGlib}, {1, 2}});
+
 // Keeps the CPU time per iteration of the validation for the summary.
 class Reporter : public benchmark::ConsoleReporter {
  public:
@@ -226,6 +279,10 @@ void printSummary() {
                   answer, median, gFigures[k + " bare round trip median us"], validation,
                   median / floor, median / floor <= 3.0 ? "met" : "MISSED");
     }
+    for (const char* street : {" street cellular", " street wlan"})
+      std::printf("  %-4s%-20s median %.2f us, p99 %.2f us (scenario answering at once)\n",
+                  k.c_str(), street, gFigures[k + street + " median us"],
+                  gFigures[k + street + " p99 us"]);
     const double pushed = gFigures[k + " pushed results/s"];
     const double bare = gFigures[k + " bare calls/s"];
     if (pushed > 0 && bare > 0)
