@@ -175,6 +175,11 @@ SharedPointer<GenericObject> ConverterOxel::convertOxelWlan2Wlan(const OxelObser
   }
   SharedPointer<s::WlanDn> dn = made(s::WlanDn::create());
   check(dn->setBssid(bytes, count));
+  if (!e.ssid().empty()) {
+    SharedPointer<gom::GenericObject> extra = made(dn->extension());
+    check(extra->setStringProperty(kSsidProperty,
+                                   made(gom::CharacterData::create(e.ssid().data(), static_cast<unsigned int>(e.ssid().size())))));
+  }
   m->setDn(dn);
 
   SharedPointer<s::WlanApMeasurement> ap = made(s::WlanApMeasurement::create());

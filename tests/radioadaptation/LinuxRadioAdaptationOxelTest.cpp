@@ -153,6 +153,11 @@ TEST_P(Adaptation, EveryTechnologyIsConvertedWithItsFieldsAndGaps) {
   EXPECT_EQ(ap->wlanApMeasurement()->rxLevel(), -51);
   EXPECT_EQ(ap->wlanApMeasurement()->txLevel(), 20);
   EXPECT_EQ(ap->wlanApMeasurement()->rssi(), 88);
+  SharedPointer<gom::CharacterData> ssid;
+  ASSERT_TRUE(ap->dn()->isExtended());
+  ASSERT_EQ(ap->dn()->extensionReference()->getStringProperty(
+                radioadaptation::ConverterOxel::kSsidProperty, ssid), Ok);
+  EXPECT_EQ(std::string(ssid->data(), ssid->length()), "office");
   SharedPointer<WlanMeasurement> eight = WlanMeasurement::create(c->wlanMeasurement(1));
   EXPECT_EQ(eight->dn()->bssid(), 0x001A2B3C4D5E6F70ull);
   EXPECT_TRUE(eight->wlanApMeasurement()->valueExists(WlanApMeasurement::RxLevel));

@@ -5,7 +5,10 @@
 // kinds are skipped. Each measurement takes the element's time stamp, its
 // cell identity, and the serving and neighbour values the element carries;
 // values the library marks "not available" (255, or an unset ...Set()
-// flag) stay absent. Values keep the library's units.
+// flag) stay absent. Values keep the library's units. An access point's
+// network name, when the library knows it, is attached to its WlanDn as
+// property kSsidProperty (a string) of the record's extension: it lives
+// with the object in memory and is not part of the record's bytes.
 //
 // All static; failures throw a Status (OutOfMemory when a record cannot be
 // made, WrongObjectType for an element whose class does not match its id, or
@@ -22,6 +25,9 @@ namespace radioadaptation {
 class LODESTACK_EXPORT ConverterOxel {
  public:
   ConverterOxel() = delete;
+
+  // The extension property of a WlanDn that holds the network name.
+  static constexpr unsigned short kSsidProperty = 1;
 
   // Converts every element of `result`, in order, into `container`.
   static void convertOxelMeasurement(const OxelMeasurements& result,
