@@ -1,5 +1,6 @@
 #include "lodestack/radioadaptation/ConverterOxel.h"
 
+#include "lodestack/gom/CharacterData.h"
 #include "lodestack/schema/EUtra.h"
 #include "lodestack/schema/Geran.h"
 #include "lodestack/schema/UtraFdd.h"
@@ -177,8 +178,10 @@ SharedPointer<GenericObject> ConverterOxel::convertOxelWlan2Wlan(const OxelObser
   check(dn->setBssid(bytes, count));
   if (!e.ssid().empty()) {
     SharedPointer<gom::GenericObject> extra = made(dn->extension());
-    check(extra->setStringProperty(kSsidProperty,
-                                   made(gom::CharacterData::create(e.ssid().data(), static_cast<unsigned int>(e.ssid().size())))));
+    const std::string& ssid = e.ssid();
+    check(extra->setStringProperty(
+        kSsidProperty,
+        made(gom::CharacterData::create(ssid.data(), static_cast<unsigned int>(ssid.size())))));
   }
   m->setDn(dn);
 
