@@ -4,31 +4,19 @@
 #include <exception>
 #include <new>
 
-#include "lodestack/debug/Debug.h"
 #include "lodestack/radioadaptation/ConverterOxel.h"
 #include "lodestack/radioadaptation/MeasurementTracingOxel.h"
 #include "lodestack/radioadaptation/RadioAdaptationFactory.h"
 #include "lodestack/schema/Gnss.h"
 #include "lodestack/schema/MeasurementContainer.h"
 #include "radioadaptation/LinuxRadioAdaptationOxelPrivate.h"
+#include "radioadaptation/RadioLog.h"
 
 namespace lodestack {
 namespace radioadaptation {
 
 using gom::GenericObject;
 using gom::SharedPointer;
-
-namespace {
-
-void log(const char* format, ...) LODESTACK_PRINTF(1, 2);
-void log(const char* format, ...) {
-  va_list args;
-  va_start(args, format);
-  Debug::logva(Debug::Level1, gRadioAdaptationComponentName, format, args);
-  va_end(args);
-}
-
-}  // namespace
 
 IRadioAdaptation* RadioAdaptationFactory::createRadioAdaptation() {
   LinuxRadioAdaptationOxel* adaptation = new LinuxRadioAdaptationOxel();
@@ -60,7 +48,7 @@ bool LinuxRadioAdaptationOxel::init() {
   try {
     radioMeasurements = new RadioMeasurements();
   } catch (const std::exception& e) {
-    log("measurement library not started: %s\n", e.what());
+    radioLog("measurement library not started: %s\n", e.what());
     return false;
   }
   return true;
@@ -98,7 +86,7 @@ Status LinuxRadioAdaptationOxel::doCancelRequest(MeasurementType type) {
 Status LinuxRadioAdaptationOxel::requestCellularMeasurements() {
   try {
     if (radioMeasurements->unreliableMeasurementsAfterTechChange()) {
-      log("cellular request refused: radio technology just changed\n");
+      radioLog("cellular request refused: radio technology just changed\n");
       return Failed;
     }
     cellScanStarting = true;
@@ -120,7 +108,7 @@ Status LinuxRadioAdaptationOxel::requestCellularMeasurements() {
     return Ok;
   } catch (const std::exception& e) {
     cellScanStarting = false;
-    log("cellular measurement not started: %s\n", e.what());
+    radioLog("cellular measurement not started: %s\n", e.what());
     return Failed;
   } catch (...) {
     cellScanStarting = false;
@@ -136,7 +124,7 @@ Status LinuxRadioAdaptationOxel::requestWifiMeasurements() {
     return Ok;
   } catch (const std::exception& e) {
     wlanScanStarting = false;
-    log("WLAN scan not started: %s\n", e.what());
+    radioLog("WLAN scan not started: %s\n", e.what());
     return Failed;
   } catch (...) {
     wlanScanStarting = false;
@@ -156,7 +144,7 @@ void LinuxRadioAdaptationOxel::cellScanCallback(const OxelMeasurements& result) 
   try {
     handleMeasurement(Cellular, result, Ok, cellScanStarting);
   } catch (...) {
-    log("cellular result dropped\n");
+    radioLog("cellular result dropped\n");
   }
 }
 
@@ -164,7 +152,7 @@ void LinuxRadioAdaptationOxel::wlanIcdScanCallback(const OxelMeasurements& resul
   try {
     handleMeasurement(Wlan, result, Ok, wlanScanStarting);
   } catch (...) {
-    log("WLAN result dropped\n");
+    radioLog("WLAN result dropped\n");
   }
 }
 
@@ -200,7 +188,7 @@ void LinuxRadioAdaptationOxel::handleMeasurement(MeasurementType type,
     return;
   }
   SharedPointer<GenericObject> object = convert(type, result, status);
-  log("result of kind %d: %u elements, %s\n", type, result.count(), statusName(status));
+  radioLog("result of kind %d: %u elements, %s\n", type, result.count(), statusName(status));
   handleRequestComplete(type, object, status, deliverAsync);
 }
 
@@ -230,7 +218,7 @@ void LinuxRadioAdaptationOxel::onSubscriptionChanged(int types, bool subscribed)
   } catch (...) {
     // Subscribing reports nothing back; the location manager's failure is
     // logged and the next subscription tries again.
-    log("FREE GNSS: location manager not available\n");
+    radioLog("FREE GNSS: location manager not available\n");
     if (privatePart->listener) privatePart->listener->setObserver(nullptr);
   }
 }
@@ -241,7 +229,7 @@ void LinuxRadioAdaptationOxel::freeGnssScanCallback(const SharedPointer<schema::
     handleRequestComplete(Gnss, SharedPointer<GenericObject>(), status, false);
     return;
   }
-  log("%s\n", position->dumpShort("FREE GNSS", gRadioAdaptationComponentName, false).c_str());
+  radioLog("%s\n", position->dumpShort("FREE GNSS", gRadioAdaptationComponentName, false).c_str());
   if (!hasObserver()) return;
   if (status == UnreliableMeasurement) {
     handleRequestComplete(Gnss, SharedPointer<GenericObject>(), UnreliableMeasurement, false);

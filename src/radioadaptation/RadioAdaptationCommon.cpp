@@ -1,9 +1,9 @@
 #include "lodestack/radioadaptation/RadioAdaptationCommon.h"
 
 #include "lodestack/core/AsyncCallDispatcher.h"
-#include "lodestack/debug/Debug.h"
 #include "lodestack/radioadaptation/MeasurementTracing.h"
 #include "lodestack/schema/MeasurementContainer.h"
+#include "radioadaptation/RadioLog.h"
 
 namespace lodestack {
 namespace radioadaptation {
@@ -25,13 +25,6 @@ const IRadioAdaptationObserver::MeasurementType kTypesInOrder[] = {
     IRadioAdaptationObserver::Cellular, IRadioAdaptationObserver::Wlan,
     IRadioAdaptationObserver::Gnss};
 
-void log(const char* format, ...) LODESTACK_PRINTF(1, 2);
-void log(const char* format, ...) {
-  va_list args;
-  va_start(args, format);
-  Debug::logva(Debug::Level1, gRadioAdaptationComponentName, format, args);
-  va_end(args);
-}
 
 }  // namespace
 
@@ -92,17 +85,17 @@ Status RadioAdaptationCommon::requestMeasurements(int types, unsigned int& reque
   // AlreadyPending from the platform: its measurement of this kind is
   // running already, and this request will take its result.
   if (status != Ok && status != AlreadyPending) {
-    log("request %u of kind %d failed: %s\n", id, verified, statusName(status));
+    radioLog("request %u of kind %d failed: %s\n", id, verified, statusName(status));
     (void)cancelRequest(id);
     return status;
   }
   status = startCancelTimer(type);
   if (status != Ok) {
-    log("request %u: no cancel timer: %s\n", id, statusName(status));
+    radioLog("request %u: no cancel timer: %s\n", id, statusName(status));
     (void)cancelRequest(id);
     return status;
   }
-  log("request %u of kind %d started\n", id, verified);
+  radioLog("request %u of kind %d started\n", id, verified);
   requestId = id;
   return Ok;
 }
@@ -142,7 +135,7 @@ Status RadioAdaptationCommon::cancelRequest(unsigned int requestId) {
   }
   // By key: the platform may have completed the request while cancelling.
   pendingRequests.erase(type);
-  log("request %u cancelled\n", requestId);
+  radioLog("request %u cancelled\n", requestId);
   return Ok;
 }
 
@@ -167,7 +160,7 @@ void RadioAdaptationCommon::timeout(core::ITimer* timer) {
     return;
   auto pending = pendingRequests.find(type);
   if (pending == pendingRequests.end()) return;
-  log("request %u timed out\n", pending->second);
+  radioLog("request %u timed out\n", pending->second);
   (void)doCancelRequest(type);
   handleRequestComplete(type, SharedPointer<GenericObject>(), Timeout, false);
 }
@@ -203,7 +196,7 @@ void RadioAdaptationCommon::scheduleNotification(const Result& result) {
   notificationQueue.push_back(result);
   // One queued call per result keeps delivery one at a time, oldest first.
   if (!dispatcher || !dispatcher->queueAsyncCall(&asyncHelper, nullptr)) {
-    log("result of request %u dropped: no queued call\n", result.requestId);
+    radioLog("result of request %u dropped: no queued call\n", result.requestId);
     notificationQueue.pop_back();
   }
 }
@@ -221,7 +214,7 @@ void RadioAdaptationCommon::issueNextNotification() {
 
 void RadioAdaptationCommon::issueNotification(const Result& result) {
   if (!observer) return;
-  log("request %u of kind %d: %s\n", result.requestId, result.type, statusName(result.status));
+  radioLog("request %u of kind %d: %s\n", result.requestId, result.type, statusName(result.status));
   observer->radioMeasurementsReady(result.requestId, result.type, result.measurements,
                                    result.status);
 }
