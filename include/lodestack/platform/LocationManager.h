@@ -6,12 +6,21 @@
 // The host build implements it with two sources, chosen by the environment
 // variable LODESTACK_GNSS: "scenario" (the default) replays the GNSS track
 // of the scenario (LODESTACK_SCENARIO, or the built-in street);
-// "gpsd[:HOST[:PORT]]" (default localhost:2947) reads fixes from gpsd, the
-// service counting as enabled while gpsd delivers 2D or 3D fixes.
+// "gpsd[:HOST[:PORT]]" (default localhost:2947; an IPv6 address in
+// brackets) reads fixes from gpsd.
+//
+// With gpsd the service is enabled while gpsd delivers 2D or 3D fixes, and
+// disabled when a report drops below 2D, when no fix has come for 3 s, or
+// while gpsd cannot be reached; a new connection is tried every 2 s, so a
+// gpsd that is not running (yet) leaves the service disabled without
+// failing. A fix is handed over with what gpsd knows; where it does not say,
+// the horizontal accuracy is 100 m, the speed 0 km/h, the time that of
+// arrival, and altitude, climb, direction and vertical accuracy are 0.
 //
 // Threading: create, use and destroy a manager on one thread, the one
 // running lodestack's dispatcher; the state callback runs on that thread,
-// from its loop, never inside the call that registered it.
+// from its loop, never inside the call that registered it. Do not destroy
+// the manager from inside its callback.
 #ifndef LODESTACK_PLATFORM_LOCATIONMANAGER_H
 #define LODESTACK_PLATFORM_LOCATIONMANAGER_H
 

@@ -1,0 +1,317 @@
+// Helpers of the gpsd tests: the environment, free loopback ports, a fake
+// gpsd that the test scripts line by line, the real gpsd as a child process,
+// an NMEA feed for it, and a location manager whose state changes are kept.
+// Everything runs on the test thread's dispatcher.
+#ifndef LODESTACK_TESTS_PLATFORM_GPSDTESTSUPPORT_H
+#define LODESTACK_TESTS_PLATFORM_GPSDTESTSUPPORT_H
+
+#include <arpa/inet.h>
+#include <fcntl.h>
+#include <netinet/in.h>
+#include <signal.h>
+#include <spawn.h>
+#include <sys/socket.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <cstdio>
+#include <cstdlib>
+#include <ctime>
+#include <string>
+#include <thread>
+#include <vector>
+
+#include <gtest/gtest.h>
+
+#include <lodestack/lodestack.h>
+
+#include "core/CoreTestSupport.h"
+
+extern char** environ;
+
+namespace lodestack {
+namespace testing {
+
+using gom::SharedPointer;
+
+inline SharedPointer<core::IAsyncCallDispatcher> loop() {
+  return core::AsyncCallDispatcher::openDispatcher(core::AsyncCallDispatcher::MainLoopDefault);
+}
+
+inline bool runUntil(const std::function<bool()>& done, double limitSeconds) {
+  return core::testing::runUntil(*loop(), done, limitSeconds);
+}
+
+// Runs the loop for `seconds` whatever happens.
+inline void runFor(double seconds) {
+  runUntil([] { return false; }, seconds);
+}
+
+// Sets an environment variable for one scope.
+class EnvScope {
+ public:
+  EnvScope(const char* name, const std::string& value) : name_(name) {
+    if (const char* old = std::getenv(name)) old_ = old, hadOld_ = true;
+    setenv(name, value.c_str(), 1);
+  }
+  ~EnvScope() {
+    if (hadOld_)
+      setenv(name_, old_.c_str(), 1);
+    else
+      unsetenv(name_);
+  }
+
+ private:
+  const char* name_;
+  std::string old_;
+  bool hadOld_ = false;
+};
+
+inline sockaddr_in loopbackAddress(int port) {
+  sockaddr_in a{};
+  a.sin_family = AF_INET;
+  a.sin_port = htons(static_cast<unsigned short>(port));
+  a.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
+  return a;
+}
+
+// A loopback port of `type` that nobody used a moment ago.
+inline int freePort(int type) {
+  const int fd = socket(AF_INET, type, 0);
+  sockaddr_in a = loopbackAddress(0);
+  socklen_t size = sizeof a;
+  int port = -1;
+  if (bind(fd, reinterpret_cast<sockaddr*>(&a), sizeof a) == 0 &&
+      getsockname(fd, reinterpret_cast<sockaddr*>(&a), &size) == 0)
+    port = ntohs(a.sin_port);
+  close(fd);
+  return port;
+}
+
+// Whether something accepts TCP connections on the loopback port.
+inline bool accepting(int port) {
+  const int fd = socket(AF_INET, SOCK_STREAM, 0);
+  const sockaddr_in a = loopbackAddress(port);
+  const bool ok = connect(fd, reinterpret_cast<const sockaddr*>(&a), sizeof a) == 0;
+  close(fd);
+  return ok;
+}
+
+// A TCP server on the loopback speaking for gpsd: it accepts one client at a
+// time, discards what the client sends, and writes what the test says, with
+// `greeting` right after each accept.
+class FakeGpsd : public core::IPollSink {
+ public:
+  explicit FakeGpsd(int port = 0) : dispatcher_(SharedPointer<core::LinAsyncCallDispatcher>::cast(loop())) {
+    listenFd_ = socket(AF_INET, SOCK_STREAM | SOCK_NONBLOCK, 0);
+    const int one = 1;
+    setsockopt(listenFd_, SOL_SOCKET, SO_REUSEADDR, &one, sizeof one);
+    sockaddr_in a = loopbackAddress(port);
+    socklen_t size = sizeof a;
+    if (bind(listenFd_, reinterpret_cast<sockaddr*>(&a), sizeof a) == 0 && listen(listenFd_, 4) == 0 &&
+        getsockname(listenFd_, reinterpret_cast<sockaddr*>(&a), &size) == 0)
+      port_ = ntohs(a.sin_port);
+    dispatcher_->attachPollSink({listenFd_, POLLIN, 0}, this);
+  }
+  ~FakeGpsd() override {
+    dropClient();
+    dispatcher_->detachPollSink({listenFd_, POLLIN, 0});
+    close(listenFd_);
+  }
+
+  int port() const { return port_; }
+  int accepted() const { return accepted_; }
+  bool connected() const { return clientFd_ >= 0; }
+  std::string greeting;
+
+  // Writes `text` to the client; false when there is none.
+  bool send(const std::string& text) {
+    if (clientFd_ < 0) return false;
+    std::size_t done = 0;
+    while (done < text.size()) {
+      const ssize_t n = write(clientFd_, text.data() + done, text.size() - done);
+      if (n <= 0) return false;
+      done += static_cast<std::size_t>(n);
+    }
+    return true;
+  }
+
+  void dropClient() {
+    if (clientFd_ < 0) return;
+    dispatcher_->detachPollSink({clientFd_, POLLIN, 0});
+    close(clientFd_);
+    clientFd_ = -1;
+  }
+
+  void handlePollEvent(const pollfd& p) override {
+    if (p.fd == listenFd_) {
+      const int fd = accept(listenFd_, nullptr, nullptr);
+      if (fd < 0) return;
+      dropClient();
+      clientFd_ = fd;
+      ++accepted_;
+      dispatcher_->attachPollSink({clientFd_, POLLIN, 0}, this);
+      send(greeting);
+    } else if (p.fd == clientFd_) {
+      char buffer[512];
+      if (read(clientFd_, buffer, sizeof buffer) <= 0) dropClient();
+    }
+  }
+
+ private:
+  SharedPointer<core::LinAsyncCallDispatcher> dispatcher_;
+  int listenFd_ = -1, clientFd_ = -1, port_ = -1, accepted_ = 0;
+};
+
+// A location manager made from the current LODESTACK_GNSS, keeping every
+// state its callback reported and whether all came on the test thread.
+class StateLog {
+ public:
+  StateLog() {
+    created = location_manager_create(LOCATION_METHOD_GNSS, &manager);
+    if (created == LOCATION_ERROR_NONE)
+      registered = location_manager_set_service_state_changed_cb(manager, &changed, this);
+  }
+  ~StateLog() {
+    if (manager) location_manager_destroy(manager);
+  }
+
+  // The position, or the error code in `result`.
+  struct Fix {
+    int result = 0;
+    double altitude = 0, latitude = 0, longitude = 0, climb = 0, direction = 0, speed = 0;
+    double horizontal = 0, vertical = 0;
+    location_accuracy_level_e level = LOCATION_ACCURACY_NONE;
+    time_t time = 0;
+  };
+  Fix location() const {
+    Fix f;
+    f.result = location_manager_get_location(manager, &f.altitude, &f.latitude, &f.longitude,
+                                             &f.climb, &f.direction, &f.speed, &f.level,
+                                             &f.horizontal, &f.vertical, &f.time);
+    return f;
+  }
+  bool last(location_service_state_e state) const { return !states.empty() && states.back() == state; }
+
+  location_manager_h manager = nullptr;
+  int created = -1, registered = -1;
+  std::vector<location_service_state_e> states;
+  bool onTestThread = true;
+
+ private:
+  static void changed(location_service_state_e state, void* self) {
+    StateLog* log = static_cast<StateLog*>(self);
+    log->onTestThread = log->onTestThread && std::this_thread::get_id() == log->owner_;
+    log->states.push_back(state);
+  }
+  std::thread::id owner_ = std::this_thread::get_id();
+};
+
+// The gpsd binary: /usr/sbin/gpsd (not on every PATH), or gpsd on the PATH.
+inline std::string gpsdBinary() {
+  if (access("/usr/sbin/gpsd", X_OK) == 0) return "/usr/sbin/gpsd";
+  const char* path = std::getenv("PATH");
+  std::string dirs = path ? path : "";
+  for (std::size_t start = 0; start <= dirs.size();) {
+    const std::size_t end = std::min(dirs.find(':', start), dirs.size());
+    const std::string candidate = dirs.substr(start, end - start) + "/gpsd";
+    if (end > start && access(candidate.c_str(), X_OK) == 0) return candidate;
+    start = end + 1;
+  }
+  return "";
+}
+
+// gpsd in the foreground on loopback port `port`, reading NMEA datagrams
+// sent to the loopback UDP port `feedPort`; its output is discarded.
+class GpsdProcess {
+ public:
+  GpsdProcess(int port, int feedPort) : port_(port), feedPort_(feedPort) {}
+  ~GpsdProcess() { stop(); }
+
+  // Starts gpsd and waits (on the loop) until it accepts connections.
+  bool start() {
+    const std::string binary = gpsdBinary();
+    const std::string portText = std::to_string(port_);
+    const std::string device = "udp://127.0.0.1:" + std::to_string(feedPort_);
+    std::vector<std::string> args = {binary, "-N", "-n", "-S", portText, device};
+    std::vector<char*> argv;
+    for (std::string& a : args) argv.push_back(&a[0]);
+    argv.push_back(nullptr);
+    posix_spawn_file_actions_t actions;
+    posix_spawn_file_actions_init(&actions);
+    posix_spawn_file_actions_addopen(&actions, 1, "/dev/null", O_WRONLY, 0);
+    posix_spawn_file_actions_addopen(&actions, 2, "/dev/null", O_WRONLY, 0);
+    const int spawned = posix_spawn(&pid_, binary.c_str(), &actions, nullptr, argv.data(), environ);
+    posix_spawn_file_actions_destroy(&actions);
+    if (spawned != 0) {
+      pid_ = -1;
+      return false;
+    }
+    return runUntil([this] { return accepting(port_); }, 5.0);
+  }
+
+  void stop() {
+    if (pid_ <= 0) return;
+    kill(pid_, SIGTERM);
+    int status;
+    if (!runUntil([&] { return waitpid(pid_, &status, WNOHANG) == pid_; }, 3.0)) {
+      kill(pid_, SIGKILL);
+      waitpid(pid_, &status, 0);
+    }
+    pid_ = -1;
+  }
+
+ private:
+  int port_, feedPort_;
+  pid_t pid_ = -1;
+};
+
+// Sends a GGA and an RMC sentence for a fixed point, moving at 19.44 knots
+// (10 m/s), to a loopback UDP port every 200 ms while running.
+class NmeaFeed : public core::ITimerObserver {
+ public:
+  static constexpr double kLatitude = 48.1173;             // 4807.038 N
+  static constexpr double kLongitude = 11.516666666666667;  // 01131.000 E
+
+  explicit NmeaFeed(int port)
+      : fd_(socket(AF_INET, SOCK_DGRAM, 0)), to_(loopbackAddress(port)),
+        timer_(core::ITimer::create(this)) {}
+  ~NmeaFeed() override {
+    timer_->stop();
+    close(fd_);
+  }
+  void start() { timer_->start(1, 200, 0); }
+  void stop() { timer_->stop(); }
+
+  void timeout(core::ITimer*) override {
+    const std::time_t now = std::time(nullptr);
+    std::tm utc{};
+    gmtime_r(&now, &utc);
+    char hms[16], dmy[16];
+    std::strftime(hms, sizeof hms, "%H%M%S.00", &utc);
+    std::strftime(dmy, sizeof dmy, "%d%m%y", &utc);
+    const std::string text =
+        sentence(std::string("GPGGA,") + hms + ",4807.038,N,01131.000,E,1,08,0.9,545.4,M,46.9,M,,") +
+        sentence(std::string("GPRMC,") + hms + ",A,4807.038,N,01131.000,E,19.44,084.4," + dmy +
+                 ",003.1,W,A");
+    (void)sendto(fd_, text.data(), text.size(), 0, reinterpret_cast<const sockaddr*>(&to_), sizeof to_);
+  }
+
+ private:
+  static std::string sentence(const std::string& body) {
+    unsigned char sum = 0;
+    for (char c : body) sum ^= static_cast<unsigned char>(c);
+    char tail[8];
+    std::snprintf(tail, sizeof tail, "*%02X\r\n", sum);
+    return "$" + body + tail;
+  }
+
+  int fd_;
+  sockaddr_in to_;
+  SharedPointer<core::ITimer> timer_;
+};
+
+}  // namespace testing
+}  // namespace lodestack
+
+#endif  // LODESTACK_TESTS_PLATFORM_GPSDTESTSUPPORT_H
