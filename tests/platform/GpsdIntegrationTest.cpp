@@ -31,7 +31,7 @@ struct GnssObserver : IMeasurementsObserver {
 class GpsdIntegration : public ::testing::Test {
  protected:
   void SetUp() override {
-    if (gpsdBinary().empty()) GTEST_SKIP() << "gpsd is not installed (Debian package gpsd)";
+    if (!gpsdInstalled()) GTEST_SKIP() << kGpsd << " is missing: install Debian's gpsd package";
     port = freePort(SOCK_STREAM);
     feedPort = freePort(SOCK_DGRAM);
     gpsd = std::make_unique<GpsdProcess>(port, feedPort);

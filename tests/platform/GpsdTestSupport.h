@@ -97,6 +97,33 @@ inline bool accepting(int port) {
   return ok;
 }
 
+// A loopback listener whose queue is full: connecting to it hangs until it
+// closes.
+class StalledListener {
+ public:
+  StalledListener() : fd_(socket(AF_INET, SOCK_STREAM, 0)) {
+    sockaddr_in a = loopbackAddress(0);
+    socklen_t size = sizeof a;
+    if (bind(fd_, reinterpret_cast<sockaddr*>(&a), sizeof a) == 0 && listen(fd_, 0) == 0 &&
+        getsockname(fd_, reinterpret_cast<sockaddr*>(&a), &size) == 0)
+      port_ = ntohs(a.sin_port);
+    for (int i = 0; i < 3; ++i) {
+      const int c = socket(AF_INET, SOCK_STREAM | SOCK_NONBLOCK, 0);
+      (void)connect(c, reinterpret_cast<const sockaddr*>(&a), sizeof a);
+      clients_.push_back(c);
+    }
+  }
+  ~StalledListener() {
+    for (int c : clients_) close(c);
+    close(fd_);
+  }
+  int port() const { return port_; }
+
+ private:
+  int fd_, port_ = -1;
+  std::vector<int> clients_;
+};
+
 // A TCP server on the loopback speaking for gpsd: it accepts one client at a
 // time, discards what the client sends, and writes what the test says, with
 // `greeting` right after each accept.
@@ -207,19 +234,9 @@ class StateLog {
   std::thread::id owner_ = std::this_thread::get_id();
 };
 
-// The gpsd binary: /usr/sbin/gpsd (not on every PATH), or gpsd on the PATH.
-inline std::string gpsdBinary() {
-  if (access("/usr/sbin/gpsd", X_OK) == 0) return "/usr/sbin/gpsd";
-  const char* path = std::getenv("PATH");
-  std::string dirs = path ? path : "";
-  for (std::size_t start = 0; start <= dirs.size();) {
-    const std::size_t end = std::min(dirs.find(':', start), dirs.size());
-    const std::string candidate = dirs.substr(start, end - start) + "/gpsd";
-    if (end > start && access(candidate.c_str(), X_OK) == 0) return candidate;
-    start = end + 1;
-  }
-  return "";
-}
+// Where Debian's gpsd package puts the daemon.
+const char kGpsd[] = "/usr/sbin/gpsd";
+inline bool gpsdInstalled() { return access(kGpsd, X_OK) == 0; }
 
 // gpsd in the foreground on loopback port `port`, reading NMEA datagrams
 // sent to the loopback UDP port `feedPort`; its output is discarded.
@@ -230,10 +247,9 @@ class GpsdProcess {
 
   // Starts gpsd and waits (on the loop) until it accepts connections.
   bool start() {
-    const std::string binary = gpsdBinary();
     const std::string portText = std::to_string(port_);
     const std::string device = "udp://127.0.0.1:" + std::to_string(feedPort_);
-    std::vector<std::string> args = {binary, "-N", "-n", "-S", portText, device};
+    std::vector<std::string> args = {kGpsd, "-N", "-n", "-S", portText, device};
     std::vector<char*> argv;
     for (std::string& a : args) argv.push_back(&a[0]);
     argv.push_back(nullptr);
@@ -241,7 +257,7 @@ class GpsdProcess {
     posix_spawn_file_actions_init(&actions);
     posix_spawn_file_actions_addopen(&actions, 1, "/dev/null", O_WRONLY, 0);
     posix_spawn_file_actions_addopen(&actions, 2, "/dev/null", O_WRONLY, 0);
-    const int spawned = posix_spawn(&pid_, binary.c_str(), &actions, nullptr, argv.data(), environ);
+    const int spawned = posix_spawn(&pid_, kGpsd, &actions, nullptr, argv.data(), environ);
     posix_spawn_file_actions_destroy(&actions);
     if (spawned != 0) {
       pid_ = -1;

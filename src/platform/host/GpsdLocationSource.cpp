@@ -9,7 +9,8 @@
 // does not answer, a host that drops packets), so each attempt runs on a
 // thread of its own, which signals an eventfd when it is done; everything
 // else, reading included, happens on the dispatcher's thread with the socket
-// in non-blocking mode.
+// in non-blocking mode. gps_open is not reentrant (it looks the protocol up
+// with getprotobyname), so attempts of all sources take turns.
 #include <fcntl.h>
 #include <gps.h>
 #include <poll.h>
@@ -19,7 +20,9 @@
 #include <cerrno>
 #include <cmath>
 #include <cstdint>
+#include <atomic>
 #include <memory>
+#include <mutex>
 #include <system_error>
 #include <thread>
 
@@ -61,6 +64,7 @@ struct Connection {
   bool open = false;
   const char* failure = nullptr;  // why it could not connect or watch
   int doneFd = -1;
+  std::atomic<bool> abandoned{false};  // its source is gone: do not start
 
   ~Connection() {
     if (open) gps_close(&data);
@@ -70,7 +74,11 @@ struct Connection {
 
 void openConnection(const std::shared_ptr<Connection>& c, const std::string& host,
                     const std::string& port) {
-  if (gps_open(host.c_str(), port.c_str(), &c->data) != 0) {
+  static std::mutex turns;
+  std::unique_lock<std::mutex> turn(turns);
+  if (c->abandoned) {
+    c->failure = "abandoned";
+  } else if (gps_open(host.c_str(), port.c_str(), &c->data) != 0) {
     // gps_open leaves a negative libgps code in errno; its texts are static.
     c->failure = errno < 0 ? gps_errstr(errno) : "cannot connect";
   } else {
@@ -80,6 +88,7 @@ void openConnection(const std::shared_ptr<Connection>& c, const std::string& hos
         fcntl(c->data.gps_fd, F_SETFL, flags | O_NONBLOCK) < 0)
       c->failure = "cannot ask for fixes";
   }
+  turn.unlock();
   const std::uint64_t one = 1;
   (void)!write(c->doneFd, &one, sizeof one);
 }
@@ -214,7 +223,7 @@ class GpsdLocationSource : public LocationSource,
     complained_ = false;
   }
 
-  // Reads every complete message gpsd has sent; a closed connection, a read
+  // Reads the complete messages gpsd has sent; a closed connection, a read
   // error or a message too long for libgps's buffer ends the connection.
   void readMessages() {
     gps_data_t& data = connection_->data;
@@ -267,6 +276,7 @@ class GpsdLocationSource : public LocationSource,
     if (opening_) {
       // The thread keeps its share and closes what it opened when done.
       dispatcher_->detachPollSink({connection_->doneFd, POLLIN, 0});
+      connection_->abandoned = true;
       opener_.detach();
       opening_ = false;
     } else {
