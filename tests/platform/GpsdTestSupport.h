@@ -9,7 +9,6 @@
 #include <fcntl.h>
 #include <netinet/in.h>
 #include <signal.h>
-#include <spawn.h>
 #include <sys/socket.h>
 #include <sys/wait.h>
 #include <unistd.h>
@@ -26,8 +25,6 @@
 #include <lodestack/lodestack.h>
 
 #include "core/CoreTestSupport.h"
-
-extern char** environ;
 
 namespace lodestack {
 namespace testing {
@@ -238,8 +235,10 @@ class StateLog {
 const char kGpsd[] = "/usr/sbin/gpsd";
 inline bool gpsdInstalled() { return access(kGpsd, X_OK) == 0; }
 
-// gpsd in the foreground on loopback port `port`, reading NMEA datagrams
-// sent to the loopback UDP port `feedPort`; its output is discarded.
+// gpsd on loopback port `port`, reading NMEA datagrams sent to the loopback
+// UDP port `feedPort`; its output is discarded. A shell keeps it and ends it
+// when the test closes its end of a pipe, or dies (gpsd, started as root,
+// drops its privileges and with them any signal asked for on our death).
 class GpsdProcess {
  public:
   GpsdProcess(int port, int feedPort) : port_(port), feedPort_(feedPort) {}
@@ -247,28 +246,26 @@ class GpsdProcess {
 
   // Starts gpsd and waits (on the loop) until it accepts connections.
   bool start() {
-    const std::string portText = std::to_string(port_);
-    const std::string device = "udp://127.0.0.1:" + std::to_string(feedPort_);
-    std::vector<std::string> args = {kGpsd, "-N", "-n", "-S", portText, device};
-    std::vector<char*> argv;
-    for (std::string& a : args) argv.push_back(&a[0]);
-    argv.push_back(nullptr);
-    posix_spawn_file_actions_t actions;
-    posix_spawn_file_actions_init(&actions);
-    posix_spawn_file_actions_addopen(&actions, 1, "/dev/null", O_WRONLY, 0);
-    posix_spawn_file_actions_addopen(&actions, 2, "/dev/null", O_WRONLY, 0);
-    const int spawned = posix_spawn(&pid_, kGpsd, &actions, nullptr, argv.data(), environ);
-    posix_spawn_file_actions_destroy(&actions);
-    if (spawned != 0) {
-      pid_ = -1;
-      return false;
+    const std::string script = std::string(kGpsd) + " -N -n -S " + std::to_string(port_) +
+                               " udp://127.0.0.1:" + std::to_string(feedPort_) +
+                               " >/dev/null 2>&1 & read x; kill $!; wait $!";
+    int keep[2];
+    if (pipe2(keep, O_CLOEXEC) != 0) return false;
+    pid_ = fork();
+    if (pid_ == 0) {
+      dup2(keep[0], 0);
+      execl("/bin/sh", "sh", "-c", script.c_str(), static_cast<char*>(nullptr));
+      _exit(127);
     }
-    return runUntil([this] { return accepting(port_); }, 5.0);
+    close(keep[0]);
+    keepFd_ = keep[1];
+    return pid_ > 0 && runUntil([this] { return accepting(port_); }, 5.0);
   }
 
   void stop() {
+    if (keepFd_ >= 0) close(keepFd_);
+    keepFd_ = -1;
     if (pid_ <= 0) return;
-    kill(pid_, SIGTERM);
     int status;
     if (!runUntil([&] { return waitpid(pid_, &status, WNOHANG) == pid_; }, 3.0)) {
       kill(pid_, SIGKILL);
@@ -279,6 +276,7 @@ class GpsdProcess {
 
  private:
   int port_, feedPort_;
+  int keepFd_ = -1;
   pid_t pid_ = -1;
 };
 
