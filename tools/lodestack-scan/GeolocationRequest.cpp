@@ -1,0 +1,148 @@
+#include "GeolocationRequest.h"
+
+#include <optional>
+#include <set>
+#include <string>
+#include <utility>
+
+namespace lodestack {
+namespace scan {
+namespace {
+
+using gom::SharedPointer;
+using schema::MeasurementContainer;
+
+std::optional<long long> number(const Json& object, const char* key) {
+  const auto it = object.find(key);
+  if (it == object.end() || !it->is_number_integer()) return std::nullopt;
+  return it->get<long long>();
+}
+
+// GSM reports the received level as RXLEV 0-63, which stands for
+// -110 dBm and below up to -48 dBm and above in 1 dB steps: dBm = RXLEV - 110.
+std::optional<long long> gsmDbm(const Json& cell) {
+  const std::optional<long long> rxLevel = number(cell, "rxLevel");
+  return rxLevel ? std::optional<long long>(*rxLevel - 110) : std::nullopt;
+}
+// UTRA cells carry RSCP in dBm.
+std::optional<long long> rscpDbm(const Json& cell) { return number(cell, "rscp"); }
+// The E-UTRA levels travel in the measurement library's own encoding, which
+// this request does not convert.
+std::optional<long long> noDbm(const Json&) { return std::nullopt; }
+
+// How one technology's measurements give cell towers.
+struct RadioKind {
+  const char* collection;  // in the measurement tree
+  const char* radioType;   // in the request
+  const char* cellIdKey;   // the cell id, in the identity and in neighbours
+  const char* areaKey;     // the location (or tracking) area code
+  std::optional<long long> (*signalDbm)(const Json&);
+  bool timingAdvance;      // whether the serving cell's value means the same
+};
+
+const RadioKind kRadioKinds[] = {
+    {"geran", "gsm", "cid", "lac", gsmDbm, true},
+    {"utraFdd", "wcdma", "ucid", "lac", rscpDbm, false},
+    // The services know no TD-SCDMA type; it is a UTRA mode like WCDMA.
+    {"utraTdd", "wcdma", "ucid", "lac", rscpDbm, false},
+    {"eutra", "lte", "ucid", "tac", noDbm, true},
+};
+
+class TowerList {
+ public:
+  void add(const RadioKind& kind, const Json& cell, const Json& serving) {
+    const std::optional<long long> cellId = number(cell, kind.cellIdKey);
+    if (!cellId) return;
+    const Json* sameCell = nullptr;
+    for (const Json& nw : neighbours(cell)) {
+      if (number(nw, kind.cellIdKey) == cellId) sameCell = &nw;
+    }
+    std::optional<long long> area = number(cell, kind.areaKey);
+    if (!area) area = number(serving, kind.areaKey);
+    std::optional<long long> dbm = kind.signalDbm(serving);
+    if (!dbm && sameCell) dbm = kind.signalDbm(*sameCell);
+    Json tower = towerOf(kind, cell, area, *cellId, dbm);
+    if (kind.timingAdvance && serving.contains("timingAdvance")) {
+      tower["timingAdvance"] = serving["timingAdvance"];
+    }
+    push(kind, *cellId, std::move(tower));
+
+    // Neighbours heard in the serving cell's report belong to its network.
+    for (const Json& nw : neighbours(cell)) {
+      const std::optional<long long> id = number(nw, kind.cellIdKey);
+      if (id && &nw != sameCell) {
+        push(kind, *id, towerOf(kind, cell, number(nw, kind.areaKey), *id, kind.signalDbm(nw)));
+      }
+    }
+  }
+
+  Json take() { return std::move(towers_); }
+
+ private:
+  static const Json& neighbours(const Json& cell) {
+    static const Json kNone = Json::array();
+    const auto it = cell.find("nwMeasurements");
+    return it == cell.end() ? kNone : *it;
+  }
+
+  static Json towerOf(const RadioKind& kind, const Json& cell, std::optional<long long> area,
+                      long long cellId, std::optional<long long> dbm) {
+    Json tower = Json::object();
+    tower["radioType"] = kind.radioType;
+    if (cell.contains("mcc")) tower["mobileCountryCode"] = cell["mcc"];
+    if (cell.contains("mnc")) tower["mobileNetworkCode"] = cell["mnc"];
+    if (area) tower["locationAreaCode"] = *area;
+    tower["cellId"] = cellId;
+    if (dbm) tower["signalStrength"] = *dbm;
+    return tower;
+  }
+
+  // One entry per cell, the first (the serving cell's) winning.
+  void push(const RadioKind& kind, long long cellId, Json tower) {
+    if (seen_.emplace(kind.radioType, cellId).second) towers_.push_back(std::move(tower));
+  }
+
+  Json towers_ = Json::array();
+  std::set<std::pair<std::string, long long>> seen_;
+};
+
+Json treeOf(const SharedPointer<MeasurementContainer>& container) {
+  return container ? measurementTree(container->wrappedObject()) : Json::object();
+}
+
+}  // namespace
+
+Json geolocationRequest(const SharedPointer<MeasurementContainer>& cellular,
+                        const SharedPointer<MeasurementContainer>& wlan) {
+  const Json cells = treeOf(cellular);
+  TowerList towers;
+  for (const RadioKind& kind : kRadioKinds) {
+    const auto list = cells.find(kind.collection);
+    if (list == cells.end()) continue;
+    for (const Json& cell : *list) {
+      towers.add(kind, cell, cell.value("servingCellMeasurement", Json::object()));
+    }
+  }
+
+  Json accessPoints = Json::array();
+  const Json aps = treeOf(wlan);
+  const auto list = aps.find("wlan");
+  if (list != aps.end()) {
+    for (const Json& ap : *list) {
+      const auto bssid = ap.find("bssid");
+      if (bssid == ap.end() || bssid->get<std::string>().size() != 17) continue;  // 6 bytes
+      Json entry = Json::object();
+      entry["macAddress"] = *bssid;
+      if (ap.contains("rxLevel")) entry["signalStrength"] = ap["rxLevel"];  // dBm
+      accessPoints.push_back(std::move(entry));
+    }
+  }
+
+  Json request = Json::object();
+  request["cellTowers"] = towers.take();
+  request["wifiAccessPoints"] = std::move(accessPoints);
+  return request;
+}
+
+}  // namespace scan
+}  // namespace lodestack

@@ -1,0 +1,223 @@
+#include "Scan.h"
+
+#include <signal.h>
+
+#include <algorithm>
+#include <chrono>
+#include <csignal>
+#include <cstdlib>
+#include <memory>
+#include <string>
+
+#include <lodestack/core/AsyncCallDispatcher.h>
+#include <lodestack/measurements/MeasurementsProvider.h>
+#include <lodestack/platform/HostPlatform.h>
+#include <lodestack/radioadaptation/RadioAdaptationFactory.h>
+
+#include "ResultPrinter.h"
+#include "ResultsFile.h"
+
+namespace lodestack {
+namespace scan {
+namespace {
+
+using Clock = std::chrono::steady_clock;
+
+// The longest the loop sleeps before it looks at the signal flag again. A
+// signal also ends the dispatcher's poll at once (the handlers do not ask
+// for restarted calls); this bounds the wait when it lands just before it.
+constexpr int kSliceMs = 100;
+
+volatile std::sig_atomic_t caughtSignal = 0;
+
+extern "C" void onSignal(int signalNumber) { caughtSignal = signalNumber; }
+
+// SIGINT and SIGTERM only set caughtSignal while a scan runs.
+class SignalHandlers {
+ public:
+  SignalHandlers() {
+    caughtSignal = 0;
+    struct sigaction action {};
+    action.sa_handler = onSignal;
+    sigemptyset(&action.sa_mask);
+    sigaction(SIGINT, &action, &oldInt_);
+    sigaction(SIGTERM, &action, &oldTerm_);
+  }
+  ~SignalHandlers() {
+    sigaction(SIGINT, &oldInt_, nullptr);
+    sigaction(SIGTERM, &oldTerm_, nullptr);
+  }
+  SignalHandlers(const SignalHandlers&) = delete;
+  SignalHandlers& operator=(const SignalHandlers&) = delete;
+
+ private:
+  struct sigaction oldInt_ {};
+  struct sigaction oldTerm_ {};
+};
+
+// Receives every result, prints and records it, and tells when the round's
+// requests are all answered.
+class Session : public IMeasurementsObserver {
+ public:
+  Session(ResultPrinter& printer, ResultsWriter* writer, std::ostream& err)
+      : printer_(printer), writer_(writer), err_(err) {}
+
+  void measurementsReady(unsigned int requestId, int types,
+                         gom::SharedPointer<gom::GenericObject> measurements,
+                         Status status) override {
+    report(Result{types, requestId, status, measurements});
+    // Request ids start at 1, so 0 never matches a pending request.
+    if (types == Cellular && requestId == pendingCellular_) pendingCellular_ = 0;
+    if (types == Wlan && requestId == pendingWlan_) pendingWlan_ = 0;
+    if (types == Gnss) waitingForGnss_ = false;
+  }
+
+  void report(const Result& result) {
+    try {
+      printer_.print(result);
+    } catch (Status) {
+      fail("a " + std::string(kindName(result.kind)) + " result is not a measurement tree");
+    }
+    std::string error;
+    if (writer_ && !writer_->write(result, error)) fail(error);
+  }
+
+  void expect(int kind, unsigned int requestId) {
+    (kind == Cellular ? pendingCellular_ : pendingWlan_) = requestId;
+  }
+  // A round without requests lasts until the next GNSS fix.
+  void waitForGnss() { waitingForGnss_ = true; }
+  bool roundDone() const { return !pendingCellular_ && !pendingWlan_ && !waitingForGnss_; }
+
+  void endRound() {
+    try {
+      printer_.endRound();
+    } catch (Status) {
+      fail("the round's results are not measurement trees");
+    }
+  }
+
+  bool failed() const { return failed_; }
+
+ private:
+  void fail(const std::string& error) {
+    if (!failed_) err_ << "lodestack-scan: " << error << "\n";
+    failed_ = true;
+  }
+
+  ResultPrinter& printer_;
+  ResultsWriter* writer_;
+  std::ostream& err_;
+  unsigned int pendingCellular_ = 0;
+  unsigned int pendingWlan_ = 0;
+  bool waitingForGnss_ = false;
+  bool failed_ = false;
+};
+
+class Scanner {
+ public:
+  Scanner(const Options& options, core::IAsyncCallDispatcher& dispatcher,
+          MeasurementsProvider& provider, Session& session)
+      : options_(options), dispatcher_(dispatcher), provider_(provider), session_(session) {}
+
+  void run() {
+    for (int round = 1; going(); ++round) {
+      request(IMeasurementsObserver::Cellular);
+      request(IMeasurementsObserver::Wlan);
+      if (!(options_.kinds & (IMeasurementsObserver::Cellular | IMeasurementsObserver::Wlan))) {
+        session_.waitForGnss();
+      }
+      while (going() && !session_.roundDone()) dispatcher_.sleep(kSliceMs);
+      if (!going()) return;
+      session_.endRound();
+      if (options_.rounds != 0 && round >= options_.rounds) return;
+      pause(std::chrono::milliseconds(options_.intervalMs));
+    }
+  }
+
+ private:
+  bool going() const { return !caughtSignal && !session_.failed(); }
+
+  void request(int kind) {
+    if (!(options_.kinds & kind)) return;
+    unsigned int requestId = 0;
+    const Status status = provider_.requestMeasurements(kind, requestId);
+    if (status == Ok) {
+      session_.expect(kind, requestId);
+    } else {
+      // No result will come; the refusal stands in for it.
+      session_.report(Result{kind, 0, status, gom::SharedPointer<gom::GenericObject>()});
+    }
+  }
+
+  // Keeps the loop turning (GNSS fixes arrive meanwhile) for `duration`.
+  void pause(std::chrono::milliseconds duration) {
+    const Clock::time_point end = Clock::now() + duration;
+    for (Clock::time_point now = Clock::now(); going() && now < end; now = Clock::now()) {
+      const auto left = std::chrono::duration_cast<std::chrono::milliseconds>(end - now).count();
+      dispatcher_.sleep(static_cast<int>(std::min<long long>(std::max<long long>(left, 1),
+                                                             kSliceMs)));
+    }
+  }
+
+  const Options& options_;
+  core::IAsyncCallDispatcher& dispatcher_;
+  MeasurementsProvider& provider_;
+  Session& session_;
+};
+
+}  // namespace
+
+int runScan(const Options& options, std::ostream& out, std::ostream& err) {
+  const auto failWith = [&](const std::string& error) {
+    err << "lodestack-scan: " << error << "\n";
+    return ExitFailure;
+  };
+  // The host platform reads its configuration from the environment when the
+  // adaptation is made.
+  if (!options.scenario.empty()) {
+    const std::string why = platform::checkScenarioFile(options.scenario);
+    if (!why.empty()) return failWith(why);
+    setenv("LODESTACK_SCENARIO", options.scenario.c_str(), 1);
+  }
+  if (!options.gnss.empty()) setenv("LODESTACK_GNSS", options.gnss.c_str(), 1);
+
+  ResultsWriter writer;
+  std::string error;
+  if (!options.out.empty() && !writer.open(options.out, error)) return failWith(error);
+  const std::unique_ptr<ResultPrinter> printer = makePrinter(options, out);
+  const SignalHandlers signals;
+
+  // The poll-driven loop: the tool has no GLib main loop of its own, and
+  // the loop below drives the dispatcher with sleep().
+  try {
+    core::AsyncCallDispatcher::setMainLoopType(core::AsyncCallDispatcher::MainLoopPoll);
+  } catch (Status) {
+    // The thread chose its kind before; keep it.
+  }
+  const gom::SharedPointer<core::IAsyncCallDispatcher> dispatcher =
+      core::AsyncCallDispatcher::openDispatcher(core::AsyncCallDispatcher::MainLoopDefault);
+  if (!dispatcher) return failWith("the event loop could not be opened");
+
+  const std::unique_ptr<radioadaptation::IRadioAdaptation> radio(
+      radioadaptation::RadioAdaptationFactory::createRadioAdaptation());
+  if (!radio) {
+    const std::string why = platform::lastError();
+    return failWith(why.empty() ? "the radio adaptation could not be made" : why);
+  }
+  Session session(*printer, options.out.empty() ? nullptr : &writer, err);
+  {
+    // Destroyed before the adaptation: unsubscribes and cancels what is
+    // pending.
+    const std::unique_ptr<MeasurementsProvider> provider(MeasurementsProvider::create(*radio));
+    if (!provider) return failWith("the measurements provider could not be made");
+    provider->addObserver(session, options.kinds);
+    Scanner(options, *dispatcher, *provider, session).run();
+  }
+  writer.close();
+  if (caughtSignal) return 128 + caughtSignal;
+  return session.failed() ? ExitFailure : ExitOk;
+}
+
+}  // namespace scan
+}  // namespace lodestack
