@@ -1,0 +1,115 @@
+// The geolocation web-service request built from a round's results.
+#include <gtest/gtest.h>
+
+#include <lodestack/lodestack.h>
+
+#include "GeolocationRequest.h"
+
+namespace lodestack {
+namespace scan {
+namespace {
+
+using gom::SharedPointer;
+using namespace schema;
+
+SharedPointer<GeranNwMeasurement> gsmNeighbour(int lac, int cid, unsigned char rxLevel) {
+  SharedPointer<GeranNwMeasurement> n = GeranNwMeasurement::create(GeranFrequencyInfo::create(7, 60));
+  if (lac >= 0) (void)n->setLac(static_cast<unsigned short>(lac));
+  if (cid >= 0) (void)n->setCid(static_cast<unsigned short>(cid));
+  (void)n->setRxLevel(rxLevel);
+  return n;
+}
+
+SharedPointer<UtraFddNwMeasurement> wcdmaNeighbour(unsigned int ucid, signed char rscp) {
+  SharedPointer<UtraFddNwMeasurement> n =
+      UtraFddNwMeasurement::create(UtraFddFrequencyInfo::create(10700, 100));
+  (void)n->setUcid(ucid);
+  (void)n->setRscp(rscp);
+  return n;
+}
+
+TEST(GeolocationRequest, CellTowersFromEachTechnology) {
+  SharedPointer<MeasurementContainer> cells = MeasurementContainer::create();
+
+  SharedPointer<GeranCellMeasurement> gsm =
+      GeranCellMeasurement::create(GeranCellDn::create(244, 5, 4100, 21001), 1700000000u);
+  SharedPointer<GeranServingCellMeasurement> serving = GeranServingCellMeasurement::create();
+  (void)serving->setRxLevel(40);
+  (void)serving->setTimingAdvance(3);
+  gsm->setServingCellMeasurement(serving);
+  ASSERT_EQ(Ok, gsm->addNwMeasurement(gsmNeighbour(4100, 21002, 63)));
+  ASSERT_EQ(Ok, gsm->addNwMeasurement(gsmNeighbour(-1, 21003, 0)));  // area unknown
+  ASSERT_EQ(Ok, gsm->addNwMeasurement(gsmNeighbour(4100, -1, 30)));  // no cell id: no tower
+  ASSERT_EQ(Ok, cells->addGeranMeasurement(gsm->wrappedObject()));
+
+  // The serving cell's RSCP comes from its entry among the cells heard.
+  SharedPointer<UtraFddCellMeasurement> wcdma =
+      UtraFddCellMeasurement::create(UtraCellDn::create(244, 5, 0x12C0011), 1700000000u);
+  SharedPointer<UtraFddServingCellMeasurement> wcdmaServing = UtraFddServingCellMeasurement::create();
+  (void)wcdmaServing->setLac(4200);
+  wcdma->setServingCellMeasurement(wcdmaServing);
+  ASSERT_EQ(Ok, wcdma->addNwMeasurement(wcdmaNeighbour(0x12C0012, -95)));
+  ASSERT_EQ(Ok, wcdma->addNwMeasurement(wcdmaNeighbour(0x12C0011, -80)));
+  ASSERT_EQ(Ok, cells->addUtraFddMeasurement(wcdma->wrappedObject()));
+
+  SharedPointer<EUtraCellMeasurement> lte =
+      EUtraCellMeasurement::create(EUtraCellDn::create(244, 5, 0x1234501), 1700000000u);
+  SharedPointer<EUtraServingCellMeasurement> lteServing = EUtraServingCellMeasurement::create();
+  (void)lteServing->setTimingAdvance(12);
+  SharedPointer<EUtraNwMeasurement> lteNw = EUtraNwMeasurement::create();
+  (void)lteNw->setTac(300);
+  (void)lteServing->setNwMeasurement(lteNw);
+  lte->setServingCellMeasurement(lteServing);
+  ASSERT_EQ(Ok, cells->addEUtraMeasurement(lte->wrappedObject()));
+
+  // A GSM cell without a cell id gives nothing.
+  SharedPointer<GeranCellDn> anonymous = GeranCellDn::create();
+  (void)anonymous->setMcc(244);
+  ASSERT_EQ(Ok, cells->addGeranMeasurement(
+                    GeranCellMeasurement::create(anonymous, 1700000000u)->wrappedObject()));
+
+  EXPECT_EQ(Json::parse(R"({"cellTowers": [
+      {"radioType": "gsm", "mobileCountryCode": 244, "mobileNetworkCode": 5,
+       "locationAreaCode": 4100, "cellId": 21001, "signalStrength": -70, "timingAdvance": 3},
+      {"radioType": "gsm", "mobileCountryCode": 244, "mobileNetworkCode": 5,
+       "locationAreaCode": 4100, "cellId": 21002, "signalStrength": -47},
+      {"radioType": "gsm", "mobileCountryCode": 244, "mobileNetworkCode": 5,
+       "cellId": 21003, "signalStrength": -110},
+      {"radioType": "wcdma", "mobileCountryCode": 244, "mobileNetworkCode": 5,
+       "locationAreaCode": 4200, "cellId": 19660817, "signalStrength": -80},
+      {"radioType": "wcdma", "mobileCountryCode": 244, "mobileNetworkCode": 5,
+       "cellId": 19660818, "signalStrength": -95},
+      {"radioType": "lte", "mobileCountryCode": 244, "mobileNetworkCode": 5,
+       "locationAreaCode": 300, "cellId": 19088641, "timingAdvance": 12}],
+      "wifiAccessPoints": []})"),
+            geolocationRequest(cells, nullptr));
+}
+
+TEST(GeolocationRequest, AccessPointsWithMacAddresses) {
+  SharedPointer<MeasurementContainer> aps = MeasurementContainer::create();
+  const unsigned char bssid[8] = {0x00, 0x1A, 0x2B, 0x3C, 0x4D, 0x5E, 0x6F, 0x70};
+  for (unsigned int length : {6u, 8u}) {
+    SharedPointer<WlanDn> dn = WlanDn::create();
+    ASSERT_EQ(Ok, dn->setBssid(bssid, length));
+    SharedPointer<WlanMeasurement> m = WlanMeasurement::create(dn, 1700000000u);
+    SharedPointer<WlanApMeasurement> ap = WlanApMeasurement::create();
+    (void)ap->setRxLevel(-67);
+    m->setWlanApMeasurement(ap);
+    ASSERT_EQ(Ok, aps->addWlanMeasurement(m->wrappedObject()));
+  }
+  SharedPointer<WlanDn> quiet = WlanDn::create();
+  ASSERT_EQ(Ok, quiet->setBssid(bssid + 2, 6));
+  ASSERT_EQ(Ok, aps->addWlanMeasurement(WlanMeasurement::create(quiet, 1700000000u)->wrappedObject()));
+
+  // An 8-byte identifier is no MAC address; a level not measured is left out.
+  EXPECT_EQ(Json::parse(R"({"cellTowers": [], "wifiAccessPoints": [
+      {"macAddress": "00:1a:2b:3c:4d:5e", "signalStrength": -67},
+      {"macAddress": "2b:3c:4d:5e:6f:70"}]})"),
+            geolocationRequest(nullptr, aps));
+  EXPECT_EQ(Json::parse(R"({"cellTowers": [], "wifiAccessPoints": []})"),
+            geolocationRequest(nullptr, nullptr));
+}
+
+}  // namespace
+}  // namespace scan
+}  // namespace lodestack

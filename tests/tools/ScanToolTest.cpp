@@ -1,0 +1,324 @@
+// lodestack-scan end to end: the built program run as a child process on
+// the host platform's scenarios.
+#include <gtest/gtest.h>
+
+#include <fcntl.h>
+#include <poll.h>
+#include <signal.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <chrono>
+#include <cstdio>
+#include <fstream>
+#include <iterator>
+#include <regex>
+#include <sstream>
+#include <string>
+#include <utility>
+#include <vector>
+
+#include <nlohmann/json.hpp>
+
+namespace {
+
+using Json = nlohmann::json;
+using Clock = std::chrono::steady_clock;
+using Args = std::vector<std::string>;
+
+struct Outcome {
+  int exitStatus = -1;  // -1 when the child did not exit normally
+  std::string out;
+  std::string err;
+};
+
+// The tool running as a child, its output collected through pipes. Only
+// LODESTACK_SCENARIO reaches it of the host platform's variables.
+class Tool {
+ public:
+  explicit Tool(const Args& args, const std::string& scenario = std::string()) {
+    int out[2], err[2];
+    if (pipe2(out, O_CLOEXEC) != 0 || pipe2(err, O_CLOEXEC) != 0) return;
+    pid_ = fork();
+    if (pid_ == 0) {
+      dup2(out[1], 1);
+      dup2(err[1], 2);
+      unsetenv("LODESTACK_GNSS");
+      if (scenario.empty()) unsetenv("LODESTACK_SCENARIO");
+      else setenv("LODESTACK_SCENARIO", scenario.c_str(), 1);
+      std::vector<char*> argv{const_cast<char*>(LODESTACK_SCAN_TOOL)};
+      for (const std::string& a : args) argv.push_back(const_cast<char*>(a.c_str()));
+      argv.push_back(nullptr);
+      execv(argv[0], argv.data());
+      _exit(127);
+    }
+    close(out[1]);
+    close(err[1]);
+    out_ = out[0];
+    err_ = err[0];
+  }
+  ~Tool() {
+    if (pid_ > 0 && !reaped_) {
+      kill(pid_, SIGKILL);
+      waitpid(pid_, nullptr, 0);
+    }
+    if (out_ >= 0) close(out_);
+    if (err_ >= 0) close(err_);
+  }
+
+  // Collects output until stdout holds `lines` lines or the child closed it.
+  bool waitForLines(std::size_t lines) {
+    while (std::count(outcome_.out.begin(), outcome_.out.end(), '\n') < static_cast<long>(lines)) {
+      if (!pump()) return false;
+    }
+    return true;
+  }
+  void signal(int number) { kill(pid_, number); }
+
+  // Everything the child writes, and how it ended.
+  Outcome finish() {
+    while (pump()) {
+    }
+    int status = 0;
+    if (waitpid(pid_, &status, 0) == pid_ && WIFEXITED(status)) {
+      outcome_.exitStatus = WEXITSTATUS(status);
+    }
+    reaped_ = true;
+    return outcome_;
+  }
+
+ private:
+  // One read from whichever pipe is ready; false once both are closed or the
+  // child has run far too long.
+  bool pump() {
+    if (Clock::now() > deadline_) {
+      ADD_FAILURE() << "lodestack-scan ran too long";
+      return false;
+    }
+    pollfd fds[2] = {{out_, POLLIN, 0}, {err_, POLLIN, 0}};
+    if (out_ < 0 && err_ < 0) return false;
+    if (poll(fds, 2, 1000) <= 0) return true;
+    for (int i = 0; i < 2; ++i) {
+      if (!fds[i].revents) continue;
+      int& fd = i == 0 ? out_ : err_;
+      char buffer[4096];
+      const ssize_t n = read(fd, buffer, sizeof buffer);
+      if (n > 0) {
+        (i == 0 ? outcome_.out : outcome_.err).append(buffer, static_cast<std::size_t>(n));
+      } else {
+        close(fd);
+        fd = -1;
+      }
+    }
+    return true;
+  }
+
+  pid_t pid_ = -1;
+  int out_ = -1;
+  int err_ = -1;
+  bool reaped_ = false;
+  Outcome outcome_;
+  const Clock::time_point deadline_ = Clock::now() + std::chrono::seconds(120);
+};
+
+Outcome runTool(const Args& args, const std::string& scenario = std::string()) {
+  return Tool(args, scenario).finish();
+}
+
+std::vector<std::string> linesOf(const std::string& text) {
+  std::vector<std::string> lines;
+  std::istringstream in(text);
+  for (std::string line; std::getline(in, line);) lines.push_back(line);
+  return lines;
+}
+
+std::string readFile(const std::string& path) {
+  std::ifstream in(path, std::ios::binary);
+  return std::string(std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>());
+}
+void writeFile(const std::string& path, const std::string& bytes) {
+  std::ofstream(path, std::ios::binary | std::ios::trunc) << bytes;
+}
+
+// Where each record of a results file starts.
+std::vector<std::size_t> recordOffsets(const std::string& bytes) {
+  std::vector<std::size_t> offsets;
+  for (std::size_t at = 12; at + 4 <= bytes.size();) {
+    offsets.push_back(at);
+    const auto* p = reinterpret_cast<const unsigned char*>(bytes.data() + at);
+    at += 4 + (p[0] | p[1] << 8 | p[2] << 16 | static_cast<std::size_t>(p[3]) << 24);
+  }
+  return offsets;
+}
+
+class ScanToolTest : public ::testing::Test {
+ protected:
+  void TearDown() override {
+    for (const std::string& f : files_) std::remove(f.c_str());
+  }
+  std::string tempFile(const std::string& name) {
+    files_.push_back(::testing::TempDir() + "scan_" + std::to_string(getpid()) + "_" + name);
+    std::remove(files_.back().c_str());
+    return files_.back();
+  }
+
+ private:
+  std::vector<std::string> files_;
+};
+
+const std::regex kIsoTime(R"(\d{4}-\d\d-\d\dT\d\d:\d\d:\d\dZ)");
+const std::regex kBssid(R"([0-9a-f]{2}(:[0-9a-f]{2}){5}|[0-9a-f]{2}(:[0-9a-f]{2}){7})");
+
+TEST_F(ScanToolTest, JsonLinesCarryKindRequestStatusAndTree) {
+  const Outcome run = runTool({"--json", "--rounds", "2", "--interval", "0"});
+  ASSERT_EQ(0, run.exitStatus) << run.err;
+  EXPECT_EQ("", run.err);
+  std::vector<unsigned int> requestIds;
+  for (const std::string& line : linesOf(run.out)) {
+    const Json result = Json::parse(line);  // throws on a line that is not JSON
+    const std::string kind = result.at("kind");
+    ASSERT_TRUE(result.at("requestId").is_number_unsigned()) << line;
+    ASSERT_TRUE(result.at("status").is_string()) << line;
+    const Json& m = result.at("measurements");
+    if (kind == "gnss") continue;
+    requestIds.push_back(result["requestId"]);
+    EXPECT_EQ("Ok", result["status"]) << line;
+    if (kind == "cellular") {
+      ASSERT_FALSE(m.at("geran").empty()) << line;
+      for (const char* key : {"mcc", "mnc", "lac", "cid"}) EXPECT_TRUE(m["geran"][0].contains(key));
+      EXPECT_TRUE(std::regex_match(m["geran"][0].at("timeStamp").get<std::string>(), kIsoTime));
+      EXPECT_TRUE(m.at("utraFdd")[0].contains("ucid")) << line;
+    } else {
+      ASSERT_EQ("wlan", kind);
+      ASSERT_FALSE(m.at("wlan").empty()) << line;
+      for (const Json& ap : m["wlan"]) {
+        EXPECT_TRUE(std::regex_match(ap.at("bssid").get<std::string>(), kBssid)) << ap;
+        EXPECT_TRUE(ap.at("rxLevel").is_number_integer()) << ap;
+      }
+    }
+  }
+  // Two rounds, each one cellular and one WLAN request.
+  EXPECT_EQ(std::vector<unsigned int>({1, 2, 3, 4}), requestIds);
+
+  // A round without requests lasts until the next fix.
+  const Outcome fixes = runTool({"--json", "--kinds", "gnss", "--rounds", "2", "--interval", "0"});
+  ASSERT_EQ(0, fixes.exitStatus) << fixes.err;
+  const std::vector<std::string> lines = linesOf(fixes.out);
+  ASSERT_EQ(2u, lines.size()) << fixes.out;
+  for (const std::string& line : lines) {
+    const Json fix = Json::parse(line);
+    EXPECT_EQ("gnss", fix["kind"]);
+    EXPECT_EQ(0, fix["requestId"]);
+    const Json& position = fix["measurements"].at("gnss").at(0);
+    EXPECT_LE(std::abs(position.at("latitude").get<double>()), 90.0) << line;
+    EXPECT_LE(std::abs(position.at("longitude").get<double>()), 180.0) << line;
+    EXPECT_GE(position.at("speed").get<double>(), 0.0) << line;
+    EXPECT_TRUE(std::regex_match(position.at("timeStamp").get<std::string>(), kIsoTime)) << line;
+  }
+}
+
+TEST_F(ScanToolTest, DecodeOfTheResultsFileGivesTheSameOutput) {
+  for (const bool json : {true, false}) {
+    const std::string out = tempFile(json ? "json" : "text");
+    Args scan = {"--rounds", "2", "--interval", "0", "--out", out};
+    Args decode = {"decode", out};
+    if (json) {
+      scan.push_back("--json");
+      decode.push_back("--json");
+    }
+    const Outcome live = runTool(scan);
+    ASSERT_EQ(0, live.exitStatus) << live.err;
+    const Outcome again = runTool(decode);
+    EXPECT_EQ(0, again.exitStatus) << again.err;
+    EXPECT_EQ(live.out, again.out) << (json ? "json" : "text");
+  }
+}
+
+TEST_F(ScanToolTest, DamagedResultsFilesStopAtTheBadRecord) {
+  const std::string out = tempFile("whole");
+  ASSERT_EQ(0, runTool({"--rounds", "2", "--interval", "0", "--kinds", "cellular,wlan", "--out",
+                        out})
+                   .exitStatus);
+  const std::string whole = readFile(out);
+  const std::vector<std::size_t> at = recordOffsets(whole);
+  ASSERT_EQ(4u, at.size());
+  const std::vector<std::string> all = linesOf(runTool({"decode", out, "--json"}).out);
+  ASSERT_EQ(4u, all.size());
+
+  const auto check = [&](const std::string& bytes, std::size_t goodRecords,
+                         const std::string& error) {
+    const std::string damaged = tempFile("damaged");
+    writeFile(damaged, bytes);
+    const Outcome run = runTool({"decode", damaged, "--json"});
+    EXPECT_EQ(1, run.exitStatus);
+    EXPECT_EQ(std::vector<std::string>(all.begin(), all.begin() + goodRecords), linesOf(run.out));
+    EXPECT_EQ("lodestack-scan: " + damaged + ": " + error + "\n", run.err);
+  };
+  check(whole.substr(0, whole.size() - 3), 3,
+        "truncated record at byte offset " + std::to_string(at[3]));
+  std::string corrupt = whole;
+  corrupt[at[1] + 4] = 9;  // the record's kind
+  check(corrupt, 1, "corrupt record at byte offset " + std::to_string(at[1]));
+}
+
+TEST_F(ScanToolTest, BadCommandLinesAndFilesGiveOneLineAndFail) {
+  const std::string badScenario = tempFile("bad_scenario.json");
+  writeFile(badScenario, "{\"cellular\": [\n");
+  const std::string notResults = tempFile("not_results");
+  writeFile(notResults, "some other file\n");
+  struct Case {
+    Args args;
+    std::string scenario;
+    int exitStatus;
+  };
+  const Case cases[] = {
+      {{"--bogus"}, "", 2},
+      {{"--rounds", "-1"}, "", 2},
+      {{"--interval", "soon"}, "", 2},
+      {{"--kinds", "foo"}, "", 2},
+      {{"--gnss", "gpsd:localhost:0"}, "", 2},
+      {{"--json", "--geolocation-request"}, "", 2},
+      {{"decode"}, "", 2},
+      {{"--scenario", "/nonexistent/street.json"}, "", 1},
+      {{"--scenario", badScenario}, "", 1},
+      {{"--rounds", "1"}, badScenario, 1},
+      {{"--rounds", "1", "--out", notResults}, "", 1},
+      {{"decode", notResults}, "", 1},
+      {{"decode", "/nonexistent/results"}, "", 1},
+  };
+  for (const Case& c : cases) {
+    const Outcome run = runTool(c.args, c.scenario);
+    const std::string what = c.args[0] + " " + (c.args.size() > 1 ? c.args[1] : "");
+    EXPECT_EQ(c.exitStatus, run.exitStatus) << what;
+    EXPECT_EQ("", run.out) << what;
+    EXPECT_EQ(0u, run.err.find("lodestack-scan: ")) << what << ": " << run.err;
+    EXPECT_EQ(1, std::count(run.err.begin(), run.err.end(), '\n')) << what << ": " << run.err;
+  }
+  EXPECT_EQ("some other file\n", readFile(notResults));
+
+  const Outcome version = runTool({"--version"});
+  EXPECT_EQ(0, version.exitStatus);
+  EXPECT_EQ(0u, version.out.find("lodestack-scan ")) << version.out;
+}
+
+TEST_F(ScanToolTest, SignalsEndTheRunCleanly) {
+  const std::string out = tempFile("interrupted");
+  Tool tool({"--rounds", "0", "--interval", "0", "--json", "--out", out});
+  ASSERT_TRUE(tool.waitForLines(3));
+  tool.signal(SIGINT);
+  const Outcome interrupted = tool.finish();
+  EXPECT_EQ(130, interrupted.exitStatus) << interrupted.err;
+  EXPECT_EQ("", interrupted.err);
+  // Every result printed was recorded whole.
+  const Outcome decoded = runTool({"decode", out, "--json"});
+  EXPECT_EQ(0, decoded.exitStatus) << decoded.err;
+  EXPECT_EQ(interrupted.out, decoded.out);
+
+  Tool terminated({"--rounds", "0", "--interval", "0"});
+  ASSERT_TRUE(terminated.waitForLines(1));
+  terminated.signal(SIGTERM);
+  EXPECT_EQ(143, terminated.finish().exitStatus);
+}
+
+}  // namespace

@@ -1,0 +1,6 @@
+# The tool's tests reach its printers and results file through its helper
+# library, and run the built program as a child process.
+target_link_libraries(${target} PRIVATE lodestack_scan_core)
+target_compile_definitions(${target} PRIVATE
+  LODESTACK_SCAN_TOOL="$<TARGET_FILE:lodestack-scan>")
+add_dependencies(${target} lodestack-scan)
