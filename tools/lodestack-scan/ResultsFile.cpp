@@ -4,6 +4,7 @@
 #include <cstring>
 #include <vector>
 
+#include <lodestack/schema/MeasurementContainer.h>
 #include <lodestack/stream/BufferStream.h>
 
 namespace lodestack {
@@ -156,8 +157,11 @@ ResultsReader::Outcome ResultsReader::next(Result& result, std::string& error) {
   if (bodySize > kBodyHeadSize) {
     BufferStream bytes(body.data() + kBodyHeadSize, bodySize - kBodyHeadSize);
     read.measurements = gom::GenericObject::create(bytes);
-    // The container must fill the body exactly.
-    if (!read.measurements || !bytes.eof()) return fail("corrupt");
+    // A measurement container that fills the body exactly.
+    if (!read.measurements || read.measurements->key() != schema::MeasurementContainer::kTypeId ||
+        !bytes.eof()) {
+      return fail("corrupt");
+    }
   }
   offset_ += 4 + bodySize;
   result = read;

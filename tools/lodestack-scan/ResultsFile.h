@@ -7,7 +7,7 @@
 //              status      1 byte (the Status value)
 //              requestId   4 bytes
 //              container   N - 6 bytes: the measurement container as
-//                          GenericObject::write gives it; none (N = 6)
+//                          GenericObject::write gives it (key 1); none (N = 6)
 //                          when the result carried no container
 //
 // A new or empty file gets the header first; an existing one is appended to
