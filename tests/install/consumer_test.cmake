@@ -1,4 +1,5 @@
-# Driven by ctest: install, then build and run the consumer both ways.
+# Driven by ctest: install, then build and run the consumer both ways, and the
+# installed tool.
 file(REMOVE_RECURSE ${WORK_DIR})
 set(prefix ${WORK_DIR}/prefix)
 function(run)
@@ -57,4 +58,13 @@ run(${CMAKE_COMMAND} --build ${WORK_DIR}/cmake-build)
 run(${WORK_DIR}/cmake-build/consumer)
 if(NOT last_output MATCHES "consumer ok")
   message(FATAL_ERROR "find_package consumer printed: ${last_output}")
+endif()
+
+# 3. The installed tool finds the installed library by its own RPATH.
+if(EXISTS ${prefix}/bin/lodestack-scan)
+  unset(ENV{LD_LIBRARY_PATH})
+  run(${prefix}/bin/lodestack-scan --version)
+  if(NOT last_output MATCHES "^lodestack-scan ")
+    message(FATAL_ERROR "installed lodestack-scan printed: ${last_output}")
+  endif()
 endif()

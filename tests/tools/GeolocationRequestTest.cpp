@@ -50,6 +50,7 @@ TEST(GeolocationRequest, CellTowersFromEachTechnology) {
   wcdma->setServingCellMeasurement(wcdmaServing);
   ASSERT_EQ(Ok, wcdma->addNwMeasurement(wcdmaNeighbour(0x12C0012, -95)));
   ASSERT_EQ(Ok, wcdma->addNwMeasurement(wcdmaNeighbour(0x12C0011, -80)));
+  ASSERT_EQ(Ok, wcdma->addNwMeasurement(wcdmaNeighbour(0, -99)));  // id not read: no tower
   ASSERT_EQ(Ok, cells->addUtraFddMeasurement(wcdma->wrappedObject()));
 
   SharedPointer<EUtraCellMeasurement> lte =

@@ -18,6 +18,13 @@ std::optional<long long> number(const Json& object, const char* key) {
   return it->get<long long>();
 }
 
+// A cell id of 0 is what the measurement library reports for a neighbour
+// whose id it did not read (UTRA neighbours always carry one).
+std::optional<long long> cellIdOf(const Json& object, const char* key) {
+  const std::optional<long long> id = number(object, key);
+  return id && *id != 0 ? id : std::nullopt;
+}
+
 // GSM reports the received level as RXLEV 0-63, which stands for
 // -110 dBm and below up to -48 dBm and above in 1 dB steps: dBm = RXLEV - 110.
 std::optional<long long> gsmDbm(const Json& cell) {
@@ -51,7 +58,7 @@ const RadioKind kRadioKinds[] = {
 class TowerList {
  public:
   void add(const RadioKind& kind, const Json& cell, const Json& serving) {
-    const std::optional<long long> cellId = number(cell, kind.cellIdKey);
+    const std::optional<long long> cellId = cellIdOf(cell, kind.cellIdKey);
     if (!cellId) return;
     const Json* sameCell = nullptr;
     for (const Json& nw : neighbours(cell)) {
@@ -69,7 +76,7 @@ class TowerList {
 
     // Neighbours heard in the serving cell's report belong to its network.
     for (const Json& nw : neighbours(cell)) {
-      const std::optional<long long> id = number(nw, kind.cellIdKey);
+      const std::optional<long long> id = cellIdOf(nw, kind.cellIdKey);
       if (id && &nw != sameCell) {
         push(kind, *id, towerOf(kind, cell, number(nw, kind.areaKey), *id, kind.signalDbm(nw)));
       }

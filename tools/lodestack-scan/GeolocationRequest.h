@@ -9,8 +9,9 @@
 //                          "signalStrength" (dBm)}, ...]}
 //
 // A value the measurements do not tell is left out; a cell whose cell id is
-// unknown, and a WLAN identifier that is not a 6-byte MAC address, give no
-// entry at all. Both lists are always present, possibly empty.
+// unknown (or 0), and a WLAN identifier that is not a 6-byte MAC address,
+// give no entry at all. Neighbour cells with an id become towers of the
+// serving cell's network. Both lists are always present, possibly empty.
 #ifndef LODESTACK_SCAN_GEOLOCATIONREQUEST_H
 #define LODESTACK_SCAN_GEOLOCATIONREQUEST_H
 
