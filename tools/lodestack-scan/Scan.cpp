@@ -76,7 +76,8 @@ class Session : public IMeasurementsObserver {
     try {
       printer_.print(result);
     } catch (Status) {
-      fail("a " + std::string(kindName(result.kind)) + " result is not a measurement tree");
+      const char* kind = kindName(result.kind);
+      fail(std::string("a ") + (kind ? kind : "measurement") + " result is not a measurement tree");
     }
     std::string error;
     if (writer_ && !writer_->write(result, error)) fail(error);
