@@ -61,7 +61,8 @@ struct UtraTdd {
   using Nw = s::UtraTddNwMeasurement;
   static constexpr unsigned short kMeasurementKey = 4, kDnKey = 101, kServingKey = 134,
                                   kNwKey = 135;
-  static constexpr unsigned char kDnMask = 7, kFrequencyInfoMask = 3, kServingPartBit = 2;
+  // The identity is UTRA-FDD's and checked by validateUtraDn.
+  static constexpr unsigned char kFrequencyInfoMask = 3, kServingPartBit = 2;
   static SharedPointer<FrequencyInfo> servingPart(const Serving& s) { return s.frequencyInfo(); }
   static Status validateServingPart(const FrequencyInfo& f) { return V::validateUtraTddFrequencyInfo(f); }
   static Status validateDn(const Dn& dn) { return V::validateUtraDn(dn); }
@@ -93,8 +94,8 @@ struct Cdma {
   using FrequencyInfo = s::CdmaFrequencyInfo;
   using Serving = s::CdmaServingCellMeasurement;
   using Nw = s::CdmaNwMeasurement;
-  static constexpr unsigned short kMeasurementKey = 17, kDnKey = 122, kServingKey = 126,
-                                  kNwKey = 127;
+  // Neighbours (key 127) are not checked.
+  static constexpr unsigned short kMeasurementKey = 17, kDnKey = 122, kServingKey = 126;
   static constexpr unsigned char kDnMask = 7, kFrequencyInfoMask = 0, kServingPartBit = 1;
   static SharedPointer<FrequencyInfo> servingPart(const Serving& s) { return s.frequencyInfo(); }
   static Status validateServingPart(const FrequencyInfo& f) { return V::validateCdmaFrequencyInfo(f); }
