@@ -1,0 +1,99 @@
+// Helpers shared by the crypto tests: hex bytes, a private secure storage
+// for one test, and the whole-file CTR reference.
+#ifndef LODESTACK_TESTS_CRYPTO_CRYPTOTESTSUPPORT_H
+#define LODESTACK_TESTS_CRYPTO_CRYPTOTESTSUPPORT_H
+
+#include <openssl/evp.h>
+#include <stdlib.h>
+#include <sys/stat.h>
+
+#include <filesystem>
+#include <string>
+#include <vector>
+
+#include "lodestack/crypto/ICryptographyUtility.h"
+#include "support/TemporaryDirectory.h"
+
+namespace lodestack {
+namespace testing {
+
+using Bytes = std::vector<unsigned char>;
+
+inline Bytes fromHex(const std::string& hex) {
+  Bytes bytes;
+  for (size_t i = 0; i + 1 < hex.size(); i += 2)
+    bytes.push_back(static_cast<unsigned char>(std::stoi(hex.substr(i, 2), nullptr, 16)));
+  return bytes;
+}
+
+inline std::string toHex(const Bytes& bytes) {
+  static const char digits[] = "0123456789abcdef";
+  std::string hex;
+  for (unsigned char b : bytes) {
+    hex += digits[b >> 4];
+    hex += digits[b & 15];
+  }
+  return hex;
+}
+
+// Points the host secure storage at a fresh directory for one scope.
+class SecureStorageScope {
+ public:
+  SecureStorageScope() : dir_(directory_.file("storage")) {
+    setenv("LODESTACK_SECURE_STORAGE_DIR", dir_.c_str(), 1);
+  }
+  ~SecureStorageScope() { unsetenv("LODESTACK_SECURE_STORAGE_DIR"); }
+
+  const std::string& path() const { return dir_; }
+  std::vector<std::string> entries() const {
+    std::vector<std::string> names;
+    std::error_code ignored;
+    for (const auto& item : std::filesystem::directory_iterator(dir_, ignored))
+      names.push_back(item.path().filename().string());
+    return names;
+  }
+  Bytes entry(const std::string& name) const { return readBytes(dir_ + "/" + name); }
+  void put(const std::string& name, const Bytes& bytes) {
+    mkdir(dir_.c_str(), 0700);
+    writeBytes(dir_ + "/" + name, bytes);
+  }
+  void makeDirectoryEntry(const std::string& name) {
+    mkdir(dir_.c_str(), 0700);
+    mkdir((dir_ + "/" + name).c_str(), 0700);
+  }
+
+ private:
+  TemporaryDirectory directory_;
+  std::string dir_;
+};
+
+inline Bytes keyAndIvOf(ICryptographyUtility& utility) {
+  unsigned char* key = nullptr;
+  unsigned char* iv = nullptr;
+  utility.getKeyAndIv(key, iv);
+  Bytes both(key, key + 16);
+  both.insert(both.end(), iv, iv + 16);
+  return both;
+}
+
+// The whole file as one AES-128-CTR stream whose counter bytes 12 to 15
+// start at zero: what the encrypted file must equal.
+inline Bytes ctrStream(const Bytes& key, const Bytes& iv, const Bytes& data) {
+  unsigned char counter[16];
+  std::copy(iv.begin(), iv.begin() + 16, counter);
+  counter[12] = counter[13] = counter[14] = counter[15] = 0;
+  Bytes out(data.size() + 16);
+  int n = 0, m = 0;
+  EVP_CIPHER_CTX* context = EVP_CIPHER_CTX_new();
+  EVP_EncryptInit_ex(context, EVP_aes_128_ctr(), nullptr, key.data(), counter);
+  EVP_EncryptUpdate(context, out.data(), &n, data.data(), static_cast<int>(data.size()));
+  EVP_EncryptFinal_ex(context, out.data() + n, &m);
+  EVP_CIPHER_CTX_free(context);
+  out.resize(static_cast<size_t>(n + m));
+  return out;
+}
+
+}  // namespace testing
+}  // namespace lodestack
+
+#endif  // LODESTACK_TESTS_CRYPTO_CRYPTOTESTSUPPORT_H
