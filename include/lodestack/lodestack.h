@@ -5,9 +5,14 @@
 // core
 #include "lodestack/core/AsyncCallDispatcher.h"
 #include "lodestack/core/AsyncCallDispatcherCommon.h"
+#include "lodestack/core/Directory.h"
+#include "lodestack/core/DirectoryLinux.h"
 #include "lodestack/core/Export.h"
+#include "lodestack/core/File.h"
 #include "lodestack/core/IAsyncCallDispatcher.h"
 #include "lodestack/core/IAsyncCallReceiver.h"
+#include "lodestack/core/IDirectory.h"
+#include "lodestack/core/IFile.h"
 #include "lodestack/core/IMutex.h"
 #include "lodestack/core/IPollSink.h"
 #include "lodestack/core/ISemaphore.h"
@@ -18,6 +23,7 @@
 #include "lodestack/core/LinPollAsyncCallDispatcher.h"
 #include "lodestack/core/Lockable.h"
 #include "lodestack/core/Status.h"
+#include "lodestack/core/Unicode.h"
 
 // gom
 #include "lodestack/gom/CharacterData.h"
@@ -74,6 +80,7 @@
 #include "lodestack/platform/HostPlatform.h"
 #include "lodestack/platform/LocationManager.h"
 #include "lodestack/platform/RadioMeasurements.h"
+#include "lodestack/platform/SecureStorage.h"
 
 // radioadaptation
 #include "lodestack/radioadaptation/ConverterOxel.h"
@@ -92,7 +99,19 @@
 #include "lodestack/measurements/MeasurementsProvider.h"
 #include "lodestack/measurements/MeasurementsValidator.h"
 
+// crypto
+#include "lodestack/crypto/CryptoFileCommon.h"
+#include "lodestack/crypto/CryptoFileLin.h"
+#include "lodestack/crypto/CryptoLinux.h"
+#include "lodestack/crypto/CryptoUtilityAdaptationCommon.h"
+#include "lodestack/crypto/CryptoUtilityVantor.h"
+#include "lodestack/crypto/ICryptoFile.h"
+#include "lodestack/crypto/ICryptography.h"
+#include "lodestack/crypto/ICryptographyUtility.h"
+
 // debug
 #include "lodestack/debug/Debug.h"
+#include "lodestack/debug/DebugCommon.h"
+#include "lodestack/debug/DebugLinux.h"
 
 #endif  // LODESTACK_LODESTACK_H
