@@ -15,10 +15,24 @@ namespace core {
 IFile::~IFile() = default;
 
 File::File(FILE* file, unsigned int capabilities)
-    : file_(file), capabilities_(capabilities), last_(None) {}
+    : file_(file), capabilities_(capabilities), last_(None), buffer_(nullptr) {}
+
+// The C library is given the memory too: without it, glibc keeps its own
+// block-sized buffer and ignores the size.
+bool File::setBuffer(unsigned int size) {
+  unsigned char* buffer = new (std::nothrow) unsigned char[size];
+  if (!buffer || std::setvbuf(file_, reinterpret_cast<char*>(buffer), _IOFBF, size) != 0) {
+    delete[] buffer;
+    return false;
+  }
+  delete[] buffer_;
+  buffer_ = buffer;
+  return true;
+}
 
 File::~File() {
   if (file_) std::fclose(file_);
+  delete[] buffer_;  // after the stream that used it
 }
 
 // Standard I/O needs a flush or a seek between output and input, and a seek
@@ -89,7 +103,7 @@ File* openCrtFile(const std::wstring& path, const char* mode, unsigned int buffe
     std::fclose(stream);
     return nullptr;
   }
-  if (bufferSize != 0 && std::setvbuf(stream, nullptr, _IOFBF, bufferSize) != 0) {
+  if (bufferSize != 0 && !file->setBuffer(bufferSize)) {
     delete file;
     throw FileError;
   }

@@ -67,6 +67,17 @@ TEST(File, ReadsAndWritesMayAlternateWithoutExplicitSeeks) {
   EXPECT_EQ(readText(dir.file("f")), "12cdXY");
 }
 
+TEST(File, BufferOfTheRequestedSize) {
+  TemporaryDirectory dir;
+  SharedPointer<File> file(Directory::createFile(dir.wide("f"), 65536));
+  ASSERT_TRUE(file);
+  const std::string text(40000, 'b');
+  ASSERT_EQ(writeString(*file, text), 40000u);
+  EXPECT_EQ(readText(dir.file("f")).size(), 0u) << "all still in the 64 KiB buffer";
+  ASSERT_TRUE(file->flush());
+  EXPECT_EQ(readText(dir.file("f")), text);
+}
+
 TEST(File, ReadOnlyFileStillClaimsEveryCapability) {
   TemporaryDirectory dir;
   writeText(dir.file("r"), "data");

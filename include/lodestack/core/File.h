@@ -52,6 +52,10 @@ class LODESTACK_EXPORT File : public IFile {
   unsigned int write(const unsigned char* src, unsigned int n) override;
   bool flush() override;
 
+  // Gives the stream a full buffer of `size` bytes, owned by the File. Call
+  // it before the first read or write; false when it cannot be set.
+  bool setBuffer(unsigned int size);
+
   FILE* stream() const { return file_; }
 
  private:
@@ -61,10 +65,12 @@ class LODESTACK_EXPORT File : public IFile {
   FILE* file_;
   unsigned int capabilities_;
   LastOperation last_;
+  unsigned char* buffer_;  // the stream's buffer when the File provides it
 };
 
 // Converts `path`, opens it with fopen(path, mode) and, for a non-zero
-// `bufferSize`, gives the stream a full buffer of that size. Returns a new
+// `bufferSize`, gives the stream a full buffer of that size (allocated and
+// owned by the File). Returns a new
 // File (count 0, owned by the caller) or null when the path does not convert,
 // the file cannot be opened or the object cannot be allocated. Throws
 // Status FileError (12) when the buffer cannot be set; the file is closed
