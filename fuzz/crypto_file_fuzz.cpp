@@ -56,11 +56,12 @@ class MemoryFile : public core::IFile {
   bool canWrite() const override { return true; }
   unsigned int read(unsigned char* dst, unsigned int n) override {
     const unsigned int count = at_ >= bytes_.size() ? 0 : std::min<unsigned int>(n, bytes_.size() - at_);
-    std::memcpy(dst, bytes_.data() + at_, count);
+    if (count > 0) std::memcpy(dst, bytes_.data() + at_, count);
     at_ += count;
     return count;
   }
   unsigned int write(const unsigned char* src, unsigned int n) override {
+    if (n == 0) return 0;
     if (bytes_.size() < at_ + n) bytes_.resize(at_ + n);
     std::memcpy(bytes_.data() + at_, src, n);
     at_ += n;
