@@ -26,42 +26,30 @@ std::string readString(IStream& stream, unsigned int n) {
   return text;
 }
 
-TEST(File, OpenFailuresGiveNull) {
+TEST(File, ReadsWritesAndSeeks) {
   TemporaryDirectory dir;
   EXPECT_EQ(openCrtFile(dir.wide("missing"), "rb", 0), nullptr);
   EXPECT_EQ(openCrtFile(dir.wide("x"), "not a mode", 0), nullptr);
-  EXPECT_EQ(openCrtFile(dir.wide("x"), nullptr, 0), nullptr);
-  EXPECT_EQ(openCrtFile(dir.wide("no/such/dir"), "wb", 0), nullptr);
-  EXPECT_EQ(Directory::openFile(dir.wide("missing"), false), nullptr);
-}
-
-TEST(File, ReadsAndWritesMayAlternateWithoutExplicitSeeks) {
-  TemporaryDirectory dir;
-  SharedPointer<File> file(Directory::createFile(dir.wide("f"), 4096));
+  SharedPointer<File> file(Directory::createFile(dir.wide("f")));
   ASSERT_TRUE(file && file->good());
-  EXPECT_TRUE(file->canRead() && file->canSeek() && file->canWrite());
   ASSERT_EQ(writeString(*file, "abcdef"), 6u);
-  // Buffered bytes count in the size.
   unsigned int size = 0;
   ASSERT_TRUE(file->getSize(size));
-  EXPECT_EQ(size, 6u);
+  EXPECT_EQ(size, 6u) << "buffered bytes count";
 
+  // Reads and writes alternate without seeks of the caller's.
   ASSERT_TRUE(file->seekFromStart(2));
   EXPECT_EQ(readString(*file, 2), "cd");
-  ASSERT_EQ(writeString(*file, "XY"), 2u) << "a write straight after a read";
-  EXPECT_EQ(file->offset(), 6u);
+  ASSERT_EQ(writeString(*file, "XY"), 2u);
   ASSERT_TRUE(file->seekFromStart(0));
   ASSERT_EQ(writeString(*file, "12"), 2u);
-  EXPECT_EQ(readString(*file, 2), "cd") << "a read straight after a write";
-  EXPECT_FALSE(file->eof());
+  EXPECT_EQ(readString(*file, 2), "cd");
   EXPECT_EQ(readString(*file, 10), "XY");
-  EXPECT_TRUE(file->eof()) << "a read that hit the end";
+  EXPECT_TRUE(file->eof()) << "a read hit the end";
 
   ASSERT_TRUE(file->seekFromEnd(0));
   EXPECT_EQ(file->offset(), 6u) << "seekFromEnd(0) stands at the end";
   EXPECT_FALSE(file->eof()) << "a seek clears the end indicator";
-  ASSERT_TRUE(file->seekFromEnd(6));
-  EXPECT_EQ(file->offset(), 0u);
   EXPECT_FALSE(file->seekFromEnd(7));
   ASSERT_TRUE(file->flush());
   EXPECT_EQ(readText(dir.file("f")), "12cdXY");
@@ -83,16 +71,11 @@ TEST(File, ReadOnlyFileStillClaimsEveryCapability) {
   writeText(dir.file("r"), "data");
   SharedPointer<File> file(openCrtFile(dir.wide("r"), "rb", 0));
   ASSERT_TRUE(file);
-  EXPECT_TRUE(file->canWrite()) << "openCrtFile sets all three flags whatever the mode";
+  EXPECT_TRUE(file->canRead() && file->canSeek() && file->canWrite());
   EXPECT_EQ(writeString(*file, "x"), 0u);
   EXPECT_EQ(readText(dir.file("r")), "data");
-
   File custom(nullptr, File::CanRead | File::CanSeek);
-  EXPECT_FALSE(custom.good());
-  EXPECT_TRUE(custom.canRead() && custom.canSeek() && !custom.canWrite());
-  unsigned int size = 0;
-  EXPECT_FALSE(custom.getSize(size));
-  EXPECT_EQ(custom.read(nullptr, 1), 0u);
+  EXPECT_TRUE(!custom.good() && custom.canSeek() && !custom.canWrite());
 }
 
 }  // namespace

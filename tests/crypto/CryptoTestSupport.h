@@ -27,12 +27,8 @@ inline Bytes fromHex(const std::string& hex) {
 }
 
 inline std::string toHex(const Bytes& bytes) {
-  static const char digits[] = "0123456789abcdef";
   std::string hex;
-  for (unsigned char b : bytes) {
-    hex += digits[b >> 4];
-    hex += digits[b & 15];
-  }
+  for (unsigned char b : bytes) hex += "0123456789abcdef"[b >> 4] + std::string(1, "0123456789abcdef"[b & 15]);
   return hex;
 }
 
@@ -44,7 +40,6 @@ class SecureStorageScope {
   }
   ~SecureStorageScope() { unsetenv("LODESTACK_SECURE_STORAGE_DIR"); }
 
-  const std::string& path() const { return dir_; }
   std::vector<std::string> entries() const {
     std::vector<std::string> names;
     std::error_code ignored;
@@ -68,8 +63,7 @@ class SecureStorageScope {
 };
 
 inline Bytes keyAndIvOf(ICryptographyUtility& utility) {
-  unsigned char* key = nullptr;
-  unsigned char* iv = nullptr;
+  unsigned char *key = nullptr, *iv = nullptr;
   utility.getKeyAndIv(key, iv);
   Bytes both(key, key + 16);
   both.insert(both.end(), iv, iv + 16);
@@ -79,13 +73,11 @@ inline Bytes keyAndIvOf(ICryptographyUtility& utility) {
 // The whole file as one AES-128-CTR stream whose counter bytes 12 to 15
 // start at zero: what the encrypted file must equal.
 inline Bytes ctrStream(const Bytes& key, const Bytes& iv, const Bytes& data) {
-  unsigned char counter[16];
-  std::copy(iv.begin(), iv.begin() + 16, counter);
-  counter[12] = counter[13] = counter[14] = counter[15] = 0;
-  Bytes out(data.size() + 16);
+  Bytes counter(iv.begin(), iv.begin() + 12), out(data.size() + 16);
+  counter.resize(16, 0);
   int n = 0, m = 0;
   EVP_CIPHER_CTX* context = EVP_CIPHER_CTX_new();
-  EVP_EncryptInit_ex(context, EVP_aes_128_ctr(), nullptr, key.data(), counter);
+  EVP_EncryptInit_ex(context, EVP_aes_128_ctr(), nullptr, key.data(), counter.data());
   EVP_EncryptUpdate(context, out.data(), &n, data.data(), static_cast<int>(data.size()));
   EVP_EncryptFinal_ex(context, out.data() + n, &m);
   EVP_CIPHER_CTX_free(context);

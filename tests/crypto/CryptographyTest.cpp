@@ -1,8 +1,6 @@
 #include <openssl/evp.h>
 
 #include <memory>
-#include <set>
-#include <string>
 #include <vector>
 
 #include <gtest/gtest.h>
@@ -17,115 +15,86 @@ namespace {
 using testing::Bytes;
 using testing::fromHex;
 
-// The result of one allocating cipher call, released by the object.
-struct Result {
+// One allocating cipher call; the result is released with the object.
+struct Call {
   Status status = Failed;
   unsigned char* data = nullptr;
   unsigned long length = 0;
-  ~Result() { CryptoLinux::freeMemoryStatic(data); }
+  ~Call() { CryptoLinux::freeMemoryStatic(data); }
   Bytes bytes() const { return data ? Bytes(data, data + length) : Bytes(); }
 };
 
+Bytes run(CryptoLinux& crypto, bool encrypting, const EVP_CIPHER* cipher, const Bytes& in,
+          const Bytes& key, const Bytes& iv, Status* status = nullptr) {
+  Call call;
+  call.status = encrypting ? crypto.encrypt(cipher, in.data(), in.size(), key.data(), key.size(),
+                                            iv.data(), iv.size(), call.data, call.length)
+                           : crypto.decrypt(cipher, in.data(), in.size(), key.data(), key.size(),
+                                            iv.data(), iv.size(), call.data, call.length);
+  if (status) *status = call.status;
+  EXPECT_TRUE(call.status == Ok || (call.data == nullptr && call.length == 0));
+  return call.bytes();
+}
+
 const Bytes kKey = fromHex("2b7e151628aed2a6abf7158809cf4f3c");
+const Bytes kPlain = fromHex("6bc1bee22e409f96e93d7e117393172a");
 
 TEST(CryptoLinux, KnownAnswers) {
   CryptoLinux crypto;
-  const Bytes plain = fromHex("6bc1bee22e409f96e93d7e117393172a");
-  Result ctr;
-  const Bytes counter = fromHex("f0f1f2f3f4f5f6f7f8f9fafbfcfdfeff");
-  ctr.status = crypto.encrypt(EVP_aes_128_ctr(), plain.data(), plain.size(), kKey.data(), 16,
-                              counter.data(), 16, ctr.data, ctr.length);
-  ASSERT_EQ(ctr.status, Ok);
-  EXPECT_EQ(ctr.bytes(), fromHex("874d6191b620e3261bef6864990db6ce"));
-
-  Result cbc;
-  const Bytes iv = fromHex("000102030405060708090a0b0c0d0e0f");
-  cbc.status = crypto.encryptAes(plain.data(), plain.size(), kKey.data(), 16, iv.data(), 16,
-                                 cbc.data, cbc.length);
-  ASSERT_EQ(cbc.status, Ok);
-  ASSERT_EQ(cbc.length, 32u) << "a full block of padding after a whole block";
-  EXPECT_EQ(Bytes(cbc.data, cbc.data + 16), fromHex("7649abac8119b246cee98e9b12e9197d"));
-
+  EXPECT_EQ(run(crypto, true, EVP_aes_128_ctr(), kPlain, kKey, fromHex("f0f1f2f3f4f5f6f7f8f9fafbfcfdfeff")),
+            fromHex("874d6191b620e3261bef6864990db6ce"));
+  const Bytes cbc = run(crypto, true, EVP_aes_128_cbc(), kPlain, kKey, fromHex("000102030405060708090a0b0c0d0e0f"));
+  ASSERT_EQ(cbc.size(), 32u) << "a whole block of padding after a whole block";
+  EXPECT_EQ(Bytes(cbc.begin(), cbc.begin() + 16), fromHex("7649abac8119b246cee98e9b12e9197d"));
   unsigned char digest[16];
   ASSERT_EQ(crypto.md5Hash(reinterpret_cast<const unsigned char*>("abc"), 3, digest), Ok);
   EXPECT_EQ(Bytes(digest, digest + 16), fromHex("900150983cd24fb0d6963f7d28e17f72"));
-  ASSERT_EQ(crypto.md5Hash(nullptr, 0, digest), Ok);
-  EXPECT_EQ(Bytes(digest, digest + 16), fromHex("d41d8cd98f00b204e9800998ecf8427e"));
 }
 
-TEST(CryptoLinux, CbcRoundTripsAndRefusals) {
+TEST(CryptoLinux, CbcPaddingAndRefusals) {
   CryptoLinux crypto;
   const Bytes iv(16, 7);
-  for (size_t n : {0, 1, 15, 16, 17, 100}) {
+  for (size_t n : {0, 15, 17}) {
     const Bytes plain(n, static_cast<unsigned char>(n));
-    Result sealed, opened;
-    sealed.status = crypto.encryptAes(plain.data(), n, kKey.data(), 16, iv.data(), 16, sealed.data,
-                                      sealed.length);
-    ASSERT_EQ(sealed.status, Ok);
-    EXPECT_EQ(sealed.length, (n / 16 + 1) * 16) << n;
-    opened.status = crypto.decryptAes(sealed.data, sealed.length, kKey.data(), 16, iv.data(), 16,
-                                      opened.data, opened.length);
-    ASSERT_EQ(opened.status, Ok) << n;
-    EXPECT_EQ(opened.bytes(), plain);
-
-    if (n == 17) {
-      Result tampered;
-      sealed.data[sealed.length - 1] ^= 0x55;
-      tampered.status = crypto.decryptAes(sealed.data, sealed.length, kKey.data(), 16, iv.data(),
-                                          16, tampered.data, tampered.length);
-      EXPECT_EQ(tampered.status, Failed) << "bad padding";
-      EXPECT_TRUE(tampered.data == nullptr && tampered.length == 0);
-    }
+    Bytes sealed = run(crypto, true, EVP_aes_128_cbc(), plain, kKey, iv);
+    EXPECT_EQ(sealed.size(), (n / 16 + 1) * 16);
+    EXPECT_EQ(run(crypto, false, EVP_aes_128_cbc(), sealed, kKey, iv), plain);
+    sealed.back() ^= 0x55;
+    Status status = Ok;
+    run(crypto, false, EVP_aes_128_cbc(), sealed, kKey, iv, &status);
+    EXPECT_EQ(status, Failed) << "bad padding after " << n << " bytes";
   }
-  Result refused;
-  refused.status = crypto.encryptAes(iv.data(), 16, kKey.data(), 15, iv.data(), 16, refused.data,
-                                     refused.length);
-  EXPECT_EQ(refused.status, InvalidArgument) << "key length";
-  refused.status = crypto.encrypt(nullptr, iv.data(), 16, kKey.data(), 16, iv.data(), 16,
-                                  refused.data, refused.length);
-  EXPECT_EQ(refused.status, InvalidArgument) << "no cipher";
-  refused.status = crypto.decryptAes(iv.data(), 15, kKey.data(), 16, iv.data(), 16, refused.data,
-                                     refused.length);
-  EXPECT_EQ(refused.status, Failed) << "not a whole number of blocks";
+  Status status = Ok;
+  run(crypto, true, EVP_aes_128_cbc(), kPlain, Bytes(15, 1), iv, &status);
+  EXPECT_EQ(status, InvalidArgument) << "key length";
+  run(crypto, true, nullptr, kPlain, kKey, iv, &status);
+  EXPECT_EQ(status, InvalidArgument) << "no cipher";
 }
 
 // The context keeps the last key between calls: changing key, cipher or
 // direction must still give what a fresh object gives.
 TEST(CryptoLinux, ReusedContextFollowsEveryChange) {
   CryptoLinux reused;
-  const Bytes otherKey(16, 0xA5);
-  const Bytes plain(100, 0x3C);
-  struct Call {
+  const Bytes other(16, 0xA5), plain(100, 0x3C);
+  struct Step {
     bool encrypting;
     const EVP_CIPHER* cipher;
     const Bytes* key;
     unsigned char ivByte;
   };
-  const Call calls[] = {{true, EVP_aes_128_ctr(), &kKey, 1},    {true, EVP_aes_128_ctr(), &kKey, 2},
-                        {true, EVP_aes_128_ctr(), &otherKey, 2}, {false, EVP_aes_128_ctr(), &otherKey, 3},
-                        {true, EVP_aes_128_cbc(), &otherKey, 3}, {true, EVP_aes_128_ctr(), &kKey, 1}};
-  for (const Call& call : calls) {
-    const Bytes iv(16, call.ivByte);
-    Result got, expected;
+  for (const Step& s : {Step{true, EVP_aes_128_ctr(), &kKey, 1}, Step{true, EVP_aes_128_ctr(), &kKey, 2},
+                        Step{true, EVP_aes_128_ctr(), &other, 2}, Step{false, EVP_aes_128_ctr(), &other, 3},
+                        Step{true, EVP_aes_128_cbc(), &other, 3}, Step{true, EVP_aes_128_ctr(), &kKey, 1}}) {
     CryptoLinux fresh;
-    got.status = call.encrypting
-                     ? reused.encrypt(call.cipher, plain.data(), plain.size(), call.key->data(), 16,
-                                      iv.data(), 16, got.data, got.length)
-                     : reused.decrypt(call.cipher, plain.data(), plain.size(), call.key->data(), 16,
-                                      iv.data(), 16, got.data, got.length);
-    expected.status = call.encrypting
-                          ? fresh.encrypt(call.cipher, plain.data(), plain.size(), call.key->data(),
-                                          16, iv.data(), 16, expected.data, expected.length)
-                          : fresh.decrypt(call.cipher, plain.data(), plain.size(), call.key->data(),
-                                          16, iv.data(), 16, expected.data, expected.length);
-    ASSERT_EQ(got.status, Ok);
-    ASSERT_EQ(expected.status, Ok);
-    EXPECT_EQ(got.bytes(), expected.bytes()) << "call with iv byte " << int(call.ivByte);
+    const Bytes iv(16, s.ivByte);
+    EXPECT_EQ(run(reused, s.encrypting, s.cipher, plain, *s.key, iv),
+              run(fresh, s.encrypting, s.cipher, plain, *s.key, iv))
+        << "iv byte " << int(s.ivByte);
   }
 }
 
 TEST(CryptoUtility, GeneratedKeysArePrintableAndUniform) {
-  std::vector<unsigned char> key(94 * 300);
+  Bytes key(94 * 300);
   ASSERT_TRUE(CryptoUtilityAdaptationCommon::generateKey(static_cast<unsigned int>(key.size()), key.data()));
   std::vector<int> seen(256);
   for (unsigned char c : key) ++seen[c];
@@ -135,38 +104,21 @@ TEST(CryptoUtility, GeneratedKeysArePrintableAndUniform) {
     else
       EXPECT_GT(seen[c], 150) << "character " << c << " is rarer than a uniform draw allows";
   }
-  unsigned char a[32], b[32];
-  ASSERT_TRUE(CryptoUtilityAdaptationCommon::generateKey(32, a));
-  ASSERT_TRUE(CryptoUtilityAdaptationCommon::generateKey(32, b));
-  EXPECT_NE(Bytes(a, a + 32), Bytes(b, b + 32));
 }
 
 TEST(CryptoUtility, BuiltInStoreNeedsNoStorage) {
-  testing::SecureStorageScope storage;  // empty: nothing may be written there
+  testing::SecureStorageScope storage;
   Status status = Failed;
-  std::unique_ptr<ICryptographyUtility> utility(ICryptographyUtility::open("sltdb", status));
-  ASSERT_EQ(status, Ok);
-  ASSERT_TRUE(utility);
+  std::unique_ptr<ICryptographyUtility> one(ICryptographyUtility::open("sltdb", status));
+  std::unique_ptr<ICryptographyUtility> two(ICryptographyUtility::open("sltdb", status));
+  ASSERT_TRUE(one && two);
+  EXPECT_EQ(testing::keyAndIvOf(*one), testing::keyAndIvOf(*two)) << "constant material";
   EXPECT_TRUE(storage.entries().empty());
-  unsigned char *key = nullptr, *iv = nullptr;
-  utility->getKeyAndIv(key, iv);
-  std::unique_ptr<ICryptographyUtility> again(ICryptographyUtility::open("sltdb", status));
-  unsigned char *key2 = nullptr, *iv2 = nullptr;
-  again->getKeyAndIv(key2, iv2);
-  EXPECT_EQ(Bytes(key, key + 16), Bytes(key2, key2 + 16)) << "constant material";
-  EXPECT_EQ(Bytes(iv, iv + 16), Bytes(iv2, iv2 + 16));
-
   // The cipher opens on demand although the built-in store skips init.
-  const Bytes plain(40, 9);
-  unsigned char* sealed = nullptr;
-  unsigned long sealedLength = 0;
-  ASSERT_EQ(utility->encrypt(plain.data(), plain.size(), sealed, sealedLength), Ok);
-  unsigned char* opened = nullptr;
-  unsigned long openedLength = 0;
-  ASSERT_EQ(again->decrypt(sealed, sealedLength, opened, openedLength), Ok);
-  EXPECT_EQ(Bytes(opened, opened + openedLength), plain);
-  utility->freeMemory(sealed);
-  again->freeMemory(opened);
+  Call sealed, opened;
+  ASSERT_EQ(one->encrypt(kPlain.data(), kPlain.size(), sealed.data, sealed.length), Ok);
+  ASSERT_EQ(two->decrypt(sealed.data, sealed.length, opened.data, opened.length), Ok);
+  EXPECT_EQ(opened.bytes(), kPlain);
 }
 
 TEST(CryptoUtility, StoreKeyIsCreatedOnceAndCleared) {
@@ -176,9 +128,7 @@ TEST(CryptoUtility, StoreKeyIsCreatedOnceAndCleared) {
   ASSERT_EQ(status, Ok);
   const Bytes stored = storage.entry("results");
   ASSERT_EQ(stored.size(), 32u);
-  for (unsigned char c : stored) EXPECT_TRUE(c >= 32 && c <= 125);
   EXPECT_EQ(testing::keyAndIvOf(*first), stored);
-
   std::unique_ptr<ICryptographyUtility> second(ICryptographyUtility::open("results", status));
   ASSERT_EQ(status, Ok);
   EXPECT_EQ(testing::keyAndIvOf(*second), stored) << "the stored key is reused";
@@ -189,9 +139,6 @@ TEST(CryptoUtility, StoreKeyIsCreatedOnceAndCleared) {
   std::unique_ptr<ICryptographyUtility> third(ICryptographyUtility::open("results", status));
   ASSERT_EQ(status, Ok);
   EXPECT_NE(testing::keyAndIvOf(*third), stored);
-
-  EXPECT_EQ(ICryptographyUtility::open(nullptr, status), nullptr);
-  EXPECT_EQ(status, Failed);
 }
 
 TEST(CryptoUtility, UnusableStoredKeysAreReplacedOrFail) {
@@ -200,8 +147,7 @@ TEST(CryptoUtility, UnusableStoredKeysAreReplacedOrFail) {
   Status status = Failed;
   std::unique_ptr<ICryptographyUtility> replaced(ICryptographyUtility::open("short", status));
   ASSERT_EQ(status, Ok);
-  EXPECT_EQ(storage.entry("short").size(), 32u) << "a short entry gives way to a fresh key";
-  EXPECT_EQ(testing::keyAndIvOf(*replaced), storage.entry("short"));
+  EXPECT_EQ(testing::keyAndIvOf(*replaced), storage.entry("short")) << "a fresh key took its place";
 
   // A directory where the entry should be: unreadable, and the fresh key
   // cannot take its place, so opening fails.

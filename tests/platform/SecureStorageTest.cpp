@@ -6,7 +6,6 @@
 #include <atomic>
 #include <string>
 #include <thread>
-#include <vector>
 
 #include <gtest/gtest.h>
 
@@ -16,40 +15,37 @@
 namespace lodestack {
 namespace {
 
+using testing::readText;
 using testing::TemporaryDirectory;
 
-// Sets (or, for null, unsets) an environment variable for one scope.
+// Sets an environment variable for one scope.
 class EnvironmentScope {
  public:
-  EnvironmentScope(const char* name, const char* value) : name_(name) {
-    const char* old = getenv(name);
-    had_ = old != nullptr;
-    if (had_) old_ = old;
-    value ? setenv(name, value, 1) : unsetenv(name);
+  EnvironmentScope(const char* name, const char* value)
+      : name_(name), had_(getenv(name) != nullptr), old_(had_ ? getenv(name) : "") {
+    setenv(name, value, 1);
   }
   ~EnvironmentScope() { had_ ? setenv(name_.c_str(), old_.c_str(), 1) : unsetenv(name_.c_str()); }
 
  private:
-  std::string name_, old_;
+  std::string name_;
   bool had_;
+  std::string old_;
 };
 
+// The entry's value, or "" with the error in `result`.
 std::string get(const char* name, int* result = nullptr) {
   char* data = nullptr;
   size_t length = 99;
   const int status = ssa_get(name, &data, &length);
   if (result) *result = status;
-  std::string value = data ? std::string(data, length) : std::string();
-  if (status != 0) {
-    EXPECT_TRUE(data == nullptr && length == 0);
-  }
+  EXPECT_TRUE(status == 0 || (data == nullptr && length == 0)) << "a failed get hands out nothing";
+  const std::string value = data ? std::string(data, length) : std::string();
   free(data);
   return value;
 }
 
-int put(const char* name, const std::string& value) {
-  return ssa_put(name, value.data(), value.size());
-}
+int put(const char* name, const std::string& value) { return ssa_put(name, value.data(), value.size()); }
 
 unsigned int modeOf(const std::string& path) {
   struct stat info;
@@ -62,7 +58,7 @@ TEST(SecureStorage, PrivateFilesReplacedWhole) {
   EnvironmentScope chosen("LODESTACK_SECURE_STORAGE_DIR", storage.c_str());
   int result = 0;
   get("key", &result);
-  EXPECT_EQ(result, -ENOENT) << "nothing stored yet";
+  EXPECT_EQ(result, -ENOENT);
 
   ASSERT_EQ(put("key", std::string("first\0value", 11)), 11);
   EXPECT_EQ(modeOf(storage), 0700u);
@@ -76,21 +72,14 @@ TEST(SecureStorage, PrivateFilesReplacedWhole) {
   ASSERT_EQ(stat((storage + "/key").c_str(), &after), 0);
   EXPECT_NE(before.st_ino, after.st_ino) << "replaced by a rename, not rewritten in place";
   EXPECT_EQ(get("key"), "second");
-  ASSERT_EQ(put("empty", ""), 0);
-  EXPECT_EQ(get("empty", &result), "");
-  EXPECT_EQ(result, 0);
-
   EXPECT_EQ(ssa_delete("key"), 0);
   EXPECT_EQ(ssa_delete("key"), -ENOENT);
-  EXPECT_EQ(ssa_delete("empty"), 0);
-  EXPECT_TRUE(testing::readText(storage + "/key").empty());
   std::error_code ignored;
   EXPECT_TRUE(std::filesystem::is_empty(storage, ignored)) << "no temporary file is left";
 
-  // An existing directory of ours is narrowed to 0700.
   ASSERT_EQ(chmod(storage.c_str(), 0755), 0);
-  ASSERT_EQ(put("key", "x"), 1);
-  EXPECT_EQ(modeOf(storage), 0700u);
+  ASSERT_EQ(put("key", ""), 0);
+  EXPECT_EQ(modeOf(storage), 0700u) << "an existing directory of ours is narrowed";
 }
 
 TEST(SecureStorage, BadNamesAndEntriesFailCleanly) {
@@ -104,25 +93,22 @@ TEST(SecureStorage, BadNamesAndEntriesFailCleanly) {
     EXPECT_EQ(ssa_delete(name), -EINVAL);
   }
   EXPECT_EQ(put(std::string(201, 'n').c_str(), "x"), -EINVAL);
-  EXPECT_EQ(put(std::string(200, 'n').c_str(), "x"), 1);
   EXPECT_EQ(ssa_put("n", nullptr, 1), -EINVAL);
-  char* data = nullptr;
-  EXPECT_EQ(ssa_get("n", &data, nullptr), -EINVAL);
   EXPECT_EQ(put("big", std::string(65537, 'b')), -EFBIG);
   EXPECT_EQ(put("big", std::string(65536, 'b')), 65536);
 
-  // Unreadable entries are errors, never crashes: a directory, a symbolic link.
+  // Unreadable entries are errors: a directory, a link, an oversized file.
   ASSERT_EQ(mkdir(dir.file("folder").c_str(), 0700), 0);
   ASSERT_EQ(symlink("big", dir.file("link").c_str()), 0);
+  testing::writeText(dir.file("huge"), std::string(70000, 'h'));
   int result = 0;
   get("folder", &result);
   EXPECT_LT(result, 0);
   get("link", &result);
   EXPECT_EQ(result, -ELOOP) << "links are not followed";
-  EXPECT_LT(put("folder", "x"), 0) << "a directory is not replaced";
-  testing::writeText(dir.file("huge"), std::string(70000, 'h'));
   get("huge", &result);
   EXPECT_EQ(result, -EFBIG);
+  EXPECT_LT(put("folder", "x"), 0) << "a directory is not replaced";
 }
 
 TEST(SecureStorage, DefaultLocationFollowsXdgThenHome) {
@@ -132,18 +118,15 @@ TEST(SecureStorage, DefaultLocationFollowsXdgThenHome) {
     EnvironmentScope data("XDG_DATA_HOME", dir.file("data").c_str());
     ASSERT_EQ(put("a", "1"), 1);
   }
-  EXPECT_EQ(testing::readText(dir.file("data/lodestack/secure-storage/a")), "1");
-  {
-    EnvironmentScope relative("XDG_DATA_HOME", "relative/ignored");
-    EnvironmentScope home("HOME", dir.file("home").c_str());
-    ASSERT_EQ(put("b", "2"), 1);
-    EXPECT_EQ(get("b"), "2");
-  }
-  EXPECT_EQ(testing::readText(dir.file("home/.local/share/lodestack/secure-storage/b")), "2");
+  EXPECT_EQ(readText(dir.file("data/lodestack/secure-storage/a")), "1");
+  EnvironmentScope relative("XDG_DATA_HOME", "relative/ignored");
+  EnvironmentScope home("HOME", dir.file("home").c_str());
+  ASSERT_EQ(put("b", "2"), 1);
+  EXPECT_EQ(readText(dir.file("home/.local/share/lodestack/secure-storage/b")), "2");
   EXPECT_EQ(modeOf(dir.file("home/.local")), 0700u);
 }
 
-// Readers running beside a writer see one whole value or the other.
+// A reader running beside a writer sees one whole value or the other.
 TEST(SecureStorage, ConcurrentReadersNeverSeeHalfAValue) {
   TemporaryDirectory dir;
   EnvironmentScope chosen("LODESTACK_SECURE_STORAGE_DIR", dir.path().c_str());
@@ -152,13 +135,12 @@ TEST(SecureStorage, ConcurrentReadersNeverSeeHalfAValue) {
   std::atomic<bool> done{false};
   std::atomic<int> torn{0}, reads{0};
   std::thread reader([&] {
-    while (!done) {
+    for (; !done; ++reads) {
       const std::string value = get("k");
       if (value != a && value != b) ++torn;
-      ++reads;
     }
   });
-  for (int i = 0; i < 100; ++i) ASSERT_GT(put("k", i % 2 ? a : b), 0);
+  for (int i = 0; i < 60; ++i) ASSERT_GT(put("k", i % 2 ? a : b), 0);
   done = true;
   reader.join();
   EXPECT_EQ(torn.load(), 0) << "of " << reads.load() << " reads";
