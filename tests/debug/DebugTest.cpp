@@ -4,7 +4,6 @@
 #include <cstdarg>
 #include <cstdio>
 #include <filesystem>
-#include <regex>
 #include <sstream>
 #include <string>
 #include <thread>
@@ -170,8 +169,12 @@ TEST(DebugCommon, ReferenceCountingAndTheFacade) {
   Debug::log(Debug::Level1, "core", "after release\n");
 
   const std::string core = readText(dir.file("core.log"));
-  EXPECT_TRUE(std::regex_match(core, std::regex("P  core/42  value 7\nraw\nP  core/42  PERF [0-9]+: mark here\n")))
+  unsigned long long micros = 0;
+  int consumed = 0;
+  EXPECT_EQ(std::sscanf(core.c_str(), "P  core/42  value 7\nraw\nP  core/42  PERF %llu: mark here\n%n",
+                        &micros, &consumed), 1)
       << core;
+  EXPECT_EQ(static_cast<size_t>(consumed), core.size()) << core;
   EXPECT_EQ(readText(dir.file("main.log")),
             "P  default/42  DebugCommon::addRef: counter 1\n"
             "P  default/42  DebugCommon::addRef: counter 2\n"
@@ -197,12 +200,18 @@ TEST(DebugLinux, InstallsFromAConfigurationFile) {
   Debug::release();
 
   const std::string pid = std::to_string(getpid());
-  const std::regex line("\\d{4}-\\d\\d-\\d\\d \\d\\d:\\d\\d:\\d\\d\\.\\d{3}  RadioAdapt/" + pid +
-                        "  thread \\d line \\d+");
   std::istringstream radio(readText(dir.file("radio.log")));
   int lines = 0;
-  for (std::string text; std::getline(radio, text); ++lines)
-    ASSERT_TRUE(std::regex_match(text, line)) << "line " << lines << ": " << text;
+  for (std::string text; std::getline(radio, text); ++lines) {
+    // "YYYY-MM-DD HH:MM:SS.mmm  RadioAdapt/<pid>  thread T line I"
+    int date[7], id = 0, thread = 0, line = 0, end = 0;
+    ASSERT_EQ(std::sscanf(text.c_str(), "%4d-%2d-%2d %2d:%2d:%2d.%3d  RadioAdapt/%d  thread %d line %d%n",
+                          &date[0], &date[1], &date[2], &date[3], &date[4], &date[5], &date[6], &id,
+                          &thread, &line, &end), 10)
+        << text;
+    EXPECT_TRUE(text[10] == ' ' && text[23] == ' ' && end == static_cast<int>(text.size())) << text;
+    EXPECT_EQ(std::to_string(id), pid);
+  }
   EXPECT_EQ(lines, 800) << "every line whole";
 
   // Log files are plain names in the log directory; a missing
