@@ -4,6 +4,8 @@
 
 #include <unistd.h>
 
+#include <algorithm>
+#include <cstdlib>
 #include <fstream>
 #include <iterator>
 #include <string>
@@ -38,18 +40,18 @@ class ResultsFileTest : public ::testing::Test {
             Result{IMeasurementsObserver::Gnss, 0, Ok, fix->wrappedObject()}};
   }
 
-  void writeAll(const std::vector<Result>& results) {
+  void writeAll(const std::vector<Result>& results, const std::string& store = "") {
     ResultsWriter writer;
     std::string error;
-    ASSERT_TRUE(writer.open(path_, error)) << error;
+    ASSERT_TRUE(writer.open(path_, store, error)) << error;
     for (const Result& r : results) ASSERT_TRUE(writer.write(r, error)) << error;
   }
 
   // Reads every record; the error text when reading stops on one.
-  std::string readAll(std::vector<Result>& results) {
+  std::string readAll(std::vector<Result>& results, const std::string& store = "") {
     ResultsReader reader;
     std::string error;
-    if (!reader.open(path_, error)) return error;
+    if (!reader.open(path_, store, error)) return error;
     Result r;
     ResultsReader::Outcome outcome;
     while ((outcome = reader.next(r, error)) == ResultsReader::Record) results.push_back(r);
@@ -141,7 +143,7 @@ TEST_F(ResultsFileTest, OtherFilesAreNeitherReadNorAppendedTo) {
   setBytes(Bytes{'n', 'o', 't', ' ', 'r', 'e', 's', 'u', 'l', 't', 's', '\n'});
   ResultsWriter writer;
   std::string error;
-  EXPECT_FALSE(writer.open(path_, error));
+  EXPECT_FALSE(writer.open(path_, "", error));
   EXPECT_EQ(path_ + ": not a lodestack-scan results file; not appending to it", error);
   EXPECT_EQ(12u, bytes().size());
 
@@ -149,6 +151,42 @@ TEST_F(ResultsFileTest, OtherFilesAreNeitherReadNorAppendedTo) {
   std::vector<Result> read;
   EXPECT_EQ(path_ + ": results file version 2 is not supported (this tool knows version 1)",
             readAll(read));
+}
+
+TEST_F(ResultsFileTest, EncryptedFilesReadBackOnlyWithTheirStoresKey) {
+  // Keys go to a secure storage of the test's own.
+  const std::string storage = ::testing::TempDir() + "keys_" + std::to_string(getpid());
+  setenv("LODESTACK_SECURE_STORAGE_DIR", storage.c_str(), 1);
+  const std::vector<Result> written = samples();
+  writeAll({written[0]}, "scan-test");
+  writeAll({written[1], written[2]}, "scan-test");  // appended, still encrypted
+  const Bytes stored = bytes();
+  EXPECT_EQ(std::search(stored.begin(), stored.end(), std::begin("LODESCAN"),
+                        std::end("LODESCAN") - 1),
+            stored.end())
+      << "the header is not stored in the clear";
+
+  std::vector<Result> read;
+  EXPECT_EQ("", readAll(read, "scan-test"));
+  ASSERT_EQ(3u, read.size());
+  EXPECT_TRUE(*written[2].measurements == *read[2].measurements);
+
+  read.clear();
+  EXPECT_EQ(path_ + ": not a lodestack-scan results file", readAll(read)) << "read as plain";
+  Status status = Ok;
+  delete ICryptographyUtility::open("other-store", status);  // a store with another key
+  ASSERT_EQ(Ok, status);
+  ResultsWriter writer;
+  std::string error;
+  EXPECT_FALSE(writer.open(path_, "other-store", error)) << "never appended to with another key";
+  EXPECT_EQ(path_ + ": not a lodestack-scan results file, or not encrypted with the key of "
+                    "store other-store",
+            readAll(read, "other-store"));
+  EXPECT_EQ("store unknown-store has no key in the secure storage; nothing was encrypted with it",
+            readAll(read, "unknown-store"));
+  EXPECT_TRUE(read.empty()) << "nothing of a wrongly keyed file is read";
+  EXPECT_EQ(stored, bytes()) << "a refused file is left as it was";
+  unsetenv("LODESTACK_SECURE_STORAGE_DIR");
 }
 
 }  // namespace

@@ -5,6 +5,7 @@
 #include <fcntl.h>
 #include <poll.h>
 #include <signal.h>
+#include <sys/stat.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -251,6 +252,51 @@ TEST_F(ScanToolTest, DecodeOfTheResultsFileGivesTheSameOutput) {
     EXPECT_EQ(0, again.exitStatus) << again.err;
     EXPECT_EQ(live.out, again.out) << (json ? "json" : "text");
   }
+}
+
+TEST_F(ScanToolTest, EncryptedResultsAndTheDebugLog) {
+  // Keys and logs in places of the test's own.
+  const std::string keys = tempFile("keys");
+  setenv("LODESTACK_SECURE_STORAGE_DIR", keys.c_str(), 1);
+  const std::string logs = tempFile("logs");
+  ASSERT_EQ(0, mkdir(logs.c_str(), 0700));
+  const std::string config = tempFile("log.conf");
+  writeFile(config, "; the radio adaptation only\npath " + logs + "/\nRadioAdapt 1 radio.log\n"
+                    "Measurements 0 measurements.log\ndefault 0 other.log\n");
+  const std::string out = tempFile("encrypted");
+
+  const Outcome live = runTool({"--rounds", "1", "--interval", "0", "--kinds", "cellular,wlan",
+                                "--json", "--out", out, "--encrypt", "scan-store",
+                                "--log-config", config});
+  ASSERT_EQ(0, live.exitStatus) << live.err;
+  EXPECT_EQ(std::string::npos, readFile(out).find("LODESCAN")) << "stored in the clear";
+  const Outcome decoded = runTool({"decode", out, "--decrypt", "scan-store", "--json"});
+  EXPECT_EQ(0, decoded.exitStatus) << decoded.err;
+  EXPECT_EQ(live.out, decoded.out);
+
+  // Without the store's key nothing of the file is printed.
+  for (const Args& wrong : {Args{"decode", out}, Args{"decode", out, "--decrypt", "no-such-store"}}) {
+    const Outcome refused = runTool(wrong);
+    EXPECT_EQ(1, refused.exitStatus);
+    EXPECT_EQ("", refused.out);
+    EXPECT_EQ(1u, linesOf(refused.err).size()) << refused.err;
+  }
+
+  // The configuration let the radio adaptation's lines through, not the
+  // provider's.
+  const std::string radioLog = readFile(logs + "/radio.log");
+  EXPECT_NE(std::string::npos, radioLog.find("RadioAdapt/")) << radioLog;
+  EXPECT_NE(std::string::npos, radioLog.find("request 1 of kind 1 started")) << radioLog;
+  EXPECT_EQ(std::string::npos, radioLog.find("Measurements")) << radioLog;
+  EXPECT_EQ("", readFile(logs + "/measurements.log"));
+
+  const Outcome missing = runTool({"--rounds", "1", "--log-config", logs + "/none.conf"});
+  EXPECT_EQ(1, missing.exitStatus);
+  EXPECT_EQ(1u, linesOf(missing.err).size()) << missing.err;
+  const Outcome needsOut = runTool({"--rounds", "1", "--encrypt", "scan-store"});
+  EXPECT_EQ(2, needsOut.exitStatus) << "--encrypt without --out";
+  unsetenv("LODESTACK_SECURE_STORAGE_DIR");
+  std::system(("rm -rf " + keys + " " + logs).c_str());
 }
 
 TEST_F(ScanToolTest, DamagedResultsFilesStopAtTheBadRecord) {

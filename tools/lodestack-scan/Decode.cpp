@@ -11,7 +11,7 @@ namespace scan {
 int runDecode(const Options& options, std::ostream& out, std::ostream& err) {
   ResultsReader reader;
   std::string error;
-  if (!reader.open(options.decodePath, error)) {
+  if (!reader.open(options.decodePath, options.store, error)) {
     err << "lodestack-scan: " << error << "\n";
     return ExitFailure;
   }

@@ -77,7 +77,15 @@ int parseOptions(int argc, const char* const* argv, Options& options, std::ostre
         return validGnssSource(v) ? std::string()
                                   : "'" + v + "' is not scenario or gpsd[:HOST[:PORT]]";
       }, "");
-  app.add_option("--out", options.out, "Append every result to this results file")
+  CLI::Option* outFile =
+      app.add_option("--out", options.out, "Append every result to this results file")
+          ->type_name("FILE");
+  app.add_option("--encrypt", options.store,
+                 "Encrypt the results file with the key of this store (made on first use)")
+      ->type_name("STORE")
+      ->needs(outFile);
+  app.add_option("--log-config", options.logConfig,
+                 "Debug log configuration: what the library logs, per component, and where")
       ->type_name("FILE");
   CLI::Option* json = app.add_flag("--json", options.json, "One JSON object per result and line");
   app.add_flag("--geolocation-request", options.geolocation,
@@ -87,6 +95,8 @@ int parseOptions(int argc, const char* const* argv, Options& options, std::ostre
   CLI::App* decode = app.add_subcommand("decode", "Print a results file written by --out");
   decode->add_option("FILE", options.decodePath, "Results file")->type_name("FILE")->required();
   decode->add_flag("--json", options.json, "One JSON object per result and line");
+  decode->add_option("--decrypt", options.store, "Decrypt with the key of this store")
+      ->type_name("STORE");
   app.require_subcommand(0, 1);
 
   try {

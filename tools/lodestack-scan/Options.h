@@ -18,6 +18,8 @@ struct Options {
   std::string scenario;  // empty: LODESTACK_SCENARIO, else the built-in street
   std::string gnss;      // empty: LODESTACK_GNSS, else the scenario's track
   std::string out;       // results file to append to; empty: none
+  std::string store;     // --encrypt / decode --decrypt: the key's store; empty: plain
+  std::string logConfig;  // debug log configuration; empty: no log
   int kinds = IMeasurementsObserver::Cellular | IMeasurementsObserver::Wlan |
               IMeasurementsObserver::Gnss;
   int rounds = 3;           // 0: until interrupted

@@ -1,9 +1,11 @@
 #include "ResultsFile.h"
 
 #include <cerrno>
+#include <cstdlib>
 #include <cstring>
 #include <vector>
 
+#include <lodestack/platform/SecureStorage.h>
 #include <lodestack/schema/MeasurementContainer.h>
 #include <lodestack/stream/BufferStream.h>
 
@@ -15,6 +17,9 @@ const unsigned char kMagic[8] = {'L', 'O', 'D', 'E', 'S', 'C', 'A', 'N'};
 constexpr unsigned int kVersion = 1;
 constexpr unsigned int kHeaderSize = 12;
 constexpr unsigned int kBodyHeadSize = 6;  // kind, status, request id
+constexpr unsigned int kFileBuffer = 64 * 1024;
+// The store whose key is built into the library rather than kept.
+const char kBuiltInStore[] = "sltdb";
 
 void putUint32(unsigned char* p, unsigned int v) {
   for (int i = 0; i < 4; ++i) p[i] = static_cast<unsigned char>(v >> (8 * i));
@@ -37,6 +42,21 @@ std::string checkHeader(const unsigned char* header) {
 
 std::string systemError(const std::string& path) { return path + ": " + std::strerror(errno); }
 
+// Whether the secure storage holds a key for `store`.
+bool storeHasKey(const std::string& store) {
+  char* data = nullptr;
+  std::size_t length = 0;
+  const int got = ssa_get(store.c_str(), &data, &length);
+  std::free(data);
+  return got == 0;
+}
+
+std::string notResults(const std::string& why, bool encrypted, const std::string& store) {
+  return encrypted && why.rfind("not a", 0) == 0
+             ? why + ", or not encrypted with the key of store " + store
+             : why;
+}
+
 bool validKind(unsigned char kind) {
   return kind == IMeasurementsObserver::Cellular || kind == IMeasurementsObserver::Wlan ||
          kind == IMeasurementsObserver::Gnss;
@@ -44,38 +64,87 @@ bool validKind(unsigned char kind) {
 
 }  // namespace
 
-bool ResultsWriter::open(const std::string& path, std::string& error) {
+bool ResultsStorage::open(const std::string& path, const std::string& store, bool create,
+                          std::string& error) {
   close();
-  std::FILE* file = std::fopen(path.c_str(), "ab+");
-  if (!file) {
+  std::FILE* stream = std::fopen(path.c_str(), create ? "rb+" : "rb");
+  if (!stream && create && errno == ENOENT) stream = std::fopen(path.c_str(), "wb+");
+  if (!stream) {
     error = systemError(path);
     return false;
   }
+  file_ = gom::SharedPointer<core::File>(new core::File(stream, core::File::CanAll));
+  // The encrypted file rewrites whole blocks: a large buffer keeps that cheap.
+  file_->setBuffer(kFileBuffer);
+  if (store.empty()) return true;
+  // Reading never makes a key: a store without one encrypted nothing.
+  if (!create && store != kBuiltInStore && !storeHasKey(store)) {
+    error = "store " + store + " has no key in the secure storage; nothing was encrypted with it";
+    close();
+    return false;
+  }
+  Status status = Ok;
+  key_.reset(ICryptographyUtility::open(store.c_str(), status));
+  if (!key_) {
+    error = "store " + store + ": its key could not be read or made (" + statusName(status) + ")";
+    close();
+    return false;
+  }
+  return true;
+}
+
+IStream* ResultsStorage::stream() {
+  encrypted_.reset();
+  if (!file_ || !file_->seekFromStart(0)) return nullptr;
+  if (!key_) return file_.get();
+  encrypted_.reset(ICryptoFile::open(*file_, *key_));
+  return encrypted_.get();
+}
+
+void ResultsStorage::close() {
+  encrypted_.reset();  // writes its last block back into the file
+  file_.clear();
+  key_.reset();
+}
+
+bool ResultsWriter::open(const std::string& path, const std::string& store, std::string& error) {
+  close();
+  path_ = path;
+  if (!storage_.open(path, store, true, error)) return false;
+  IStream* stream = storage_.stream();
+  unsigned int size = 0;
+  if (!stream || !stream->getSize(size)) {
+    error = path + ": cannot be read";
+    close();
+    return false;
+  }
   unsigned char header[kHeaderSize];
-  std::fseek(file, 0, SEEK_END);
-  const long size = std::ftell(file);
   if (size > 0) {
-    std::rewind(file);
-    const std::string why = std::fread(header, 1, kHeaderSize, file) == kHeaderSize
+    const std::string why = stream->read(header, kHeaderSize) == kHeaderSize
                                 ? checkHeader(header)
                                 : "not a lodestack-scan results file";
     if (!why.empty()) {
-      std::fclose(file);
-      error = path + ": " + why + "; not appending to it";
+      error = path + ": " + notResults(why, storage_.encrypted(), store) + "; not appending to it";
+      close();
       return false;
     }
-    std::fseek(file, 0, SEEK_END);
+    // A stream that has been read from is not written through: a fresh one.
+    stream = storage_.stream();
+    if (!stream || !stream->seekFromEnd(0)) {
+      error = path + ": cannot be appended to";
+      close();
+      return false;
+    }
   } else {
     std::memcpy(header, kMagic, sizeof kMagic);
     putUint32(header + sizeof kMagic, kVersion);
-    if (std::fwrite(header, 1, kHeaderSize, file) != kHeaderSize || std::fflush(file) != 0) {
+    if (stream->write(header, kHeaderSize) != kHeaderSize || !stream->flush()) {
       error = systemError(path);
-      std::fclose(file);
+      close();
       return false;
     }
   }
-  file_ = file;
-  path_ = path;
+  stream_ = stream;
   return true;
 }
 
@@ -92,8 +161,8 @@ bool ResultsWriter::write(const Result& result, std::string& error) {
   record[5] = static_cast<unsigned char>(result.status);
   putUint32(record.data() + 6, result.requestId);
   if (containerSize) std::memcpy(record.data() + 10, container.buffer().data(), containerSize);
-  if (std::fwrite(record.data(), 1, record.size(), file_) != record.size() ||
-      std::fflush(file_) != 0) {
+  const unsigned int size = static_cast<unsigned int>(record.size());
+  if (!stream_ || stream_->write(record.data(), size) != size || !stream_->flush()) {
     error = systemError(path_);
     return false;
   }
@@ -101,31 +170,25 @@ bool ResultsWriter::write(const Result& result, std::string& error) {
 }
 
 void ResultsWriter::close() {
-  if (file_) std::fclose(file_);
-  file_ = nullptr;
+  stream_ = nullptr;
+  storage_.close();
 }
 
-ResultsReader::~ResultsReader() {
-  if (file_) std::fclose(file_);
-}
-
-bool ResultsReader::open(const std::string& path, std::string& error) {
+bool ResultsReader::open(const std::string& path, const std::string& store, std::string& error) {
   path_ = path;
-  file_ = std::fopen(path.c_str(), "rb");
-  if (!file_) {
-    error = systemError(path);
+  if (!storage_.open(path, store, false, error)) return false;
+  stream_ = storage_.stream();
+  unsigned int size = 0;
+  if (!stream_ || !stream_->getSize(size)) {
+    error = path + ": cannot be read";
     return false;
   }
-  std::fseek(file_, 0, SEEK_END);
-  const long size = std::ftell(file_);
-  std::rewind(file_);
   unsigned char header[kHeaderSize];
-  const std::string why = size >= static_cast<long>(kHeaderSize) &&
-                                  std::fread(header, 1, kHeaderSize, file_) == kHeaderSize
+  const std::string why = size >= kHeaderSize && stream_->read(header, kHeaderSize) == kHeaderSize
                               ? checkHeader(header)
                               : "not a lodestack-scan results file";
   if (!why.empty()) {
-    error = path + ": " + why;
+    error = path + ": " + notResults(why, storage_.encrypted(), store);
     return false;
   }
   size_ = static_cast<unsigned long long>(size);
@@ -142,12 +205,12 @@ ResultsReader::Outcome ResultsReader::next(Result& result, std::string& error) {
   };
   const unsigned long long left = size_ - offset_;
   unsigned char length[4];
-  if (left < 4 || std::fread(length, 1, 4, file_) != 4) return fail("truncated");
+  if (left < 4 || stream_->read(length, 4) != 4) return fail("truncated");
   const unsigned int bodySize = getUint32(length);
   if (bodySize > left - 4) return fail("truncated");
   if (bodySize < kBodyHeadSize) return fail("corrupt");
   std::vector<unsigned char> body(bodySize);
-  if (std::fread(body.data(), 1, bodySize, file_) != bodySize) return fail("truncated");
+  if (stream_->read(body.data(), bodySize) != bodySize) return fail("truncated");
   if (!validKind(body[0]) || body[1] > FileError) return fail("corrupt");
 
   Result read;

@@ -3,13 +3,17 @@
 #include <signal.h>
 
 #include <algorithm>
+#include <cerrno>
 #include <chrono>
+#include <cstdio>
+#include <cstring>
 #include <csignal>
 #include <cstdlib>
 #include <memory>
 #include <string>
 
 #include <lodestack/core/AsyncCallDispatcher.h>
+#include <lodestack/debug/DebugLinux.h>
 #include <lodestack/measurements/MeasurementsProvider.h>
 #include <lodestack/platform/HostPlatform.h>
 #include <lodestack/radioadaptation/RadioAdaptationFactory.h>
@@ -169,11 +173,40 @@ class Scanner {
 
 }  // namespace
 
+// The library logs only while a logger is installed: --log-config installs
+// one for the run and takes it down at the end.
+class LogScope {
+ public:
+  ~LogScope() {
+    if (installed_) Debug::release();
+  }
+  // Empty when installed with `path`'s settings; otherwise why not.
+  std::string install(const std::string& path) {
+    std::FILE* file = std::fopen(path.c_str(), "r");
+    if (!file) return path + ": " + std::strerror(errno);
+    std::fclose(file);
+    const Status status = DebugLinux::install(path.c_str(), nullptr);
+    installed_ = status == Ok || status == FileError;
+    if (status == Ok) return std::string();
+    if (status == FileError)
+      return path + ": the log configuration cannot be read or names a log file that cannot be written";
+    return path + ": the debug log could not be started (" + statusName(status) + ")";
+  }
+
+ private:
+  bool installed_ = false;
+};
+
 int runScan(const Options& options, std::ostream& out, std::ostream& err) {
   const auto failWith = [&](const std::string& error) {
     err << "lodestack-scan: " << error << "\n";
     return ExitFailure;
   };
+  LogScope log;
+  if (!options.logConfig.empty()) {
+    const std::string why = log.install(options.logConfig);
+    if (!why.empty()) return failWith(why);
+  }
   // The host platform reads its configuration from the environment when the
   // adaptation is made.
   if (!options.scenario.empty()) {
@@ -185,7 +218,8 @@ int runScan(const Options& options, std::ostream& out, std::ostream& err) {
 
   ResultsWriter writer;
   std::string error;
-  if (!options.out.empty() && !writer.open(options.out, error)) return failWith(error);
+  if (!options.out.empty() && !writer.open(options.out, options.store, error))
+    return failWith(error);
   const std::unique_ptr<ResultPrinter> printer = makePrinter(options, out);
   const SignalHandlers signals;
 
