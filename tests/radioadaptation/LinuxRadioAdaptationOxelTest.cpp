@@ -19,71 +19,18 @@ std::string scenario(const std::string& name) {
   return std::string(LODESTACK_SCENARIO_DIR) + "/" + name + ".json";
 }
 
-struct Recorder : IMeasurementsObserver {
-  std::vector<Delivery> got;
-  bool inside = false;  // set around requestMeasurements
-  bool calledInside = false;
-  std::chrono::steady_clock::time_point start = std::chrono::steady_clock::now();
-  void measurementsReady(unsigned int id, int types, SharedPointer<GenericObject> m,
-                         Status status) override {
-    calledInside = calledInside || inside;
-    got.push_back({id, types, m, status, core::testing::secondsSince(start)});
-  }
-  std::size_t count(int types) const {
-    std::size_t n = 0;
-    for (const Delivery& d : got) n += d.type == types;
-    return n;
-  }
-  const Delivery* last(int types) const {
-    for (auto d = got.rbegin(); d != got.rend(); ++d)
-      if (d->type == types) return &*d;
-    return nullptr;
-  }
-};
-
 // The adaptation and provider of one scenario, on the test thread.
-class Adaptation : public DispatcherFixture {
+class Adaptation : public AdaptationFixture {
  protected:
   bool open(const std::string& name, int kinds = kAll) {
     // Read again when GNSS is first subscribed: kept for the test.
     setenv("LODESTACK_SCENARIO", name.c_str(), 1);
-    radio.reset(RadioAdaptationFactory::createRadioAdaptation());
-    if (!radio) return false;
-    provider.reset(MeasurementsProvider::create(*radio));
-    if (!provider) return false;
-    provider->addObserver(observer, kinds);
-    return true;
+    return AdaptationFixture::open(kinds);
   }
   void TearDown() override {
-    provider.reset();
-    radio.reset();
+    AdaptationFixture::TearDown();
     unsetenv("LODESTACK_SCENARIO");
   }
-  Status request(int kind, unsigned int& id) {
-    observer.inside = true;
-    const Status status = provider->requestMeasurements(kind, id);
-    observer.inside = false;
-    return status;
-  }
-  // Requests one kind and waits for its result.
-  const Delivery& requestAndWait(int kind, double seconds = 5.0) {
-    unsigned int id = 0;
-    const std::size_t before = observer.count(kind);
-    EXPECT_EQ(request(kind, id), Ok);
-    EXPECT_TRUE(runUntil([&] { return observer.count(kind) > before; }, seconds));
-    static const Delivery none{};
-    const Delivery* d = observer.last(kind);
-    return d ? *d : none;
-  }
-
-  static const int kCellular = IMeasurementsObserver::Cellular;
-  static const int kWlan = IMeasurementsObserver::Wlan;
-  static const int kGnss = IMeasurementsObserver::Gnss;
-  static const int kAll = kCellular | kWlan | kGnss;
-
-  Recorder observer;
-  std::unique_ptr<IRadioAdaptation> radio;
-  std::unique_ptr<MeasurementsProvider> provider;
 };
 
 TEST_P(Adaptation, EveryTechnologyIsConvertedWithItsFieldsAndGaps) {

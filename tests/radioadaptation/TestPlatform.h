@@ -180,6 +180,30 @@ struct Delivery {
   double atSeconds;  // since the observer was made
 };
 
+// A service observer that records what reaches it, and whether anything
+// came while `inside` (set by tests around requestMeasurements) held.
+struct Recorder : IMeasurementsObserver {
+  std::vector<Delivery> got;
+  bool inside = false;  // set around requestMeasurements
+  bool calledInside = false;
+  std::chrono::steady_clock::time_point start = std::chrono::steady_clock::now();
+  void measurementsReady(unsigned int id, int types, SharedPointer<GenericObject> m,
+                         Status status) override {
+    calledInside = calledInside || inside;
+    got.push_back({id, types, m, status, core::testing::secondsSince(start)});
+  }
+  std::size_t count(int types) const {
+    std::size_t n = 0;
+    for (const Delivery& d : got) n += d.type == types;
+    return n;
+  }
+  const Delivery* last(int types) const {
+    for (auto d = got.rbegin(); d != got.rend(); ++d)
+      if (d->type == types) return &*d;
+    return nullptr;
+  }
+};
+
 // Chooses the thread's loop type for a test and gives its dispatcher.
 class DispatcherFixture : public ::testing::TestWithParam<core::AsyncCallDispatcher::MainLoopType> {
  protected:
@@ -202,6 +226,49 @@ class DispatcherFixture : public ::testing::TestWithParam<core::AsyncCallDispatc
  private:
   core::testing::LoopTypeScope scope_;
   SharedPointer<core::IAsyncCallDispatcher> dispatcher_;
+};
+
+// The factory's adaptation and a provider over it on the test thread, made
+// from the host platform's environment as it stands; `observer` watches.
+class AdaptationFixture : public DispatcherFixture {
+ protected:
+  bool open(int kinds) {
+    radio.reset(radioadaptation::RadioAdaptationFactory::createRadioAdaptation());
+    if (!radio) return false;
+    provider.reset(MeasurementsProvider::create(*radio));
+    if (!provider) return false;
+    provider->addObserver(observer, kinds);
+    return true;
+  }
+  void TearDown() override {
+    provider.reset();
+    radio.reset();
+  }
+  Status request(int kind, unsigned int& id) {
+    observer.inside = true;
+    const Status status = provider->requestMeasurements(kind, id);
+    observer.inside = false;
+    return status;
+  }
+  // Requests one kind and waits for its result.
+  const Delivery& requestAndWait(int kind, double seconds = 5.0) {
+    unsigned int id = 0;
+    const std::size_t before = observer.count(kind);
+    EXPECT_EQ(request(kind, id), Ok);
+    EXPECT_TRUE(runUntil([&] { return observer.count(kind) > before; }, seconds));
+    static const Delivery none{};
+    const Delivery* d = observer.last(kind);
+    return d ? *d : none;
+  }
+
+  static const int kCellular = IMeasurementsObserver::Cellular;
+  static const int kWlan = IMeasurementsObserver::Wlan;
+  static const int kGnss = IMeasurementsObserver::Gnss;
+  static const int kAll = kCellular | kWlan | kGnss;
+
+  Recorder observer;
+  std::unique_ptr<radioadaptation::IRadioAdaptation> radio;
+  std::unique_ptr<MeasurementsProvider> provider;
 };
 
 inline std::string loopName(
