@@ -10,13 +10,14 @@
 #include <fcntl.h>
 #include <poll.h>
 #include <signal.h>
-#include <spawn.h>
 #include <stdlib.h>
+#include <sys/prctl.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
 #include <gio/gio.h>
 
+#include <algorithm>
 #include <chrono>
 #include <filesystem>
 #include <fstream>
@@ -24,32 +25,35 @@
 #include <thread>
 #include <vector>
 
-extern char** environ;
-
 namespace lodestack {
 namespace testing {
 
-// A child process; stopped (SIGTERM, then reaped) with this object.
+// A child process; stopped (SIGTERM, then reaped) with this object, and
+// killed by the kernel should the test die first.
 class ChildProcess {
  public:
-  // Runs argv; stdout goes to `stdoutFd` (-1: /dev/null), stderr to the
-  // file `stderrPath` when given.
+  // Runs argv (argv[0] searched on PATH); stdout goes to `stdoutFd` (-1:
+  // /dev/null), stderr to the file `stderrPath` when given.
   bool start(const std::vector<std::string>& argv, int stdoutFd = -1,
              const std::string& stderrPath = std::string()) {
+    const std::string program = find(argv[0]);
     std::vector<char*> args;
     for (const std::string& a : argv) args.push_back(const_cast<char*>(a.c_str()));
     args.push_back(nullptr);
-    posix_spawn_file_actions_t actions;
-    posix_spawn_file_actions_init(&actions);
-    if (stdoutFd >= 0)
-      posix_spawn_file_actions_adddup2(&actions, stdoutFd, 1);
-    else
-      posix_spawn_file_actions_addopen(&actions, 1, "/dev/null", O_WRONLY, 0);
-    if (!stderrPath.empty())
-      posix_spawn_file_actions_addopen(&actions, 2, stderrPath.c_str(), O_WRONLY | O_CREAT, 0600);
-    const int rc = posix_spawnp(&pid_, args[0], &actions, nullptr, args.data(), environ);
-    posix_spawn_file_actions_destroy(&actions);
-    if (rc != 0) pid_ = -1;
+    const pid_t parent = getpid();
+    pid_ = fork();
+    if (pid_ == 0) {  // only async-signal-safe calls until exec
+      prctl(PR_SET_PDEATHSIG, SIGKILL);
+      if (getppid() != parent) _exit(127);
+      const int out = stdoutFd >= 0 ? stdoutFd : open("/dev/null", O_WRONLY);
+      dup2(out, 1);
+      if (!stderrPath.empty()) {
+        const int err = open(stderrPath.c_str(), O_WRONLY | O_CREAT, 0600);
+        dup2(err, 2);
+      }
+      execv(program.c_str(), args.data());
+      _exit(127);
+    }
     return pid_ > 0;
   }
   void stop() {
@@ -62,6 +66,19 @@ class ChildProcess {
   ~ChildProcess() { stop(); }
 
  private:
+  static std::string find(const std::string& name) {
+    if (name.find('/') != std::string::npos) return name;
+    const char* path = getenv("PATH");
+    std::string dirs = path ? path : "/usr/bin:/bin";
+    for (std::size_t from = 0; from <= dirs.size();) {
+      const std::size_t to = std::min(dirs.find(':', from), dirs.size());
+      const std::string candidate = dirs.substr(from, to - from) + "/" + name;
+      if (access(candidate.c_str(), X_OK) == 0) return candidate;
+      from = to + 1;
+    }
+    return name;
+  }
+
   pid_t pid_ = -1;
 };
 

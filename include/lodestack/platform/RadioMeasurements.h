@@ -4,7 +4,8 @@
 // OxelMeasurements, a list of OxelObservationElement objects of one class per
 // technology. These are the platform's own classes (global namespace). A
 // device build supplies them; the host build implements them with a
-// simulated library that replays a scenario (see doc/scenarios.md).
+// simulated library that replays a scenario (see doc/scenarios.md), or with
+// the services of the D-Bus system bus (see doc/bus-services.md).
 //
 // Values and their "not available" marks, as the library hands them over:
 // one-byte quantities use 255 for "not available"; fields with a ...Set()
@@ -291,9 +292,12 @@ class RadioMeasurementsImpl;
 
 // The measurement library object. One per adaptation, made and used on the
 // thread of the adaptation's dispatcher. The host build's constructor loads
-// the scenario (LODESTACK_SCENARIO, or the built-in street) and throws
-// std::runtime_error naming the file and the fault when it cannot; the
-// reason is also kept for lodestack::platform::lastError().
+// the scenario (LODESTACK_SCENARIO, or the built-in street) for the kinds
+// that replay it, and starts the bus sources LODESTACK_WLAN and
+// LODESTACK_CELLS choose (see HostPlatform.h); it throws
+// std::runtime_error naming the fault when it cannot (a scenario that does
+// not load, an unknown choice); the reason is also kept for
+// lodestack::platform::lastError().
 class LODESTACK_EXPORT RadioMeasurements {
  public:
   using Callback = void (*)(void* context, OxelMeasurements result);

@@ -151,6 +151,10 @@ void BusSession::wait(const BusService& service, const std::function<bool()>& do
                       const std::string& what) {
   const std::string from = owner(service);
   GMainContext* context = g_main_context_get_thread_default();
+  // Owner changes the bus announced before it answered owner() are queued
+  // here already: heard first, so that the watch is not older than `from`.
+  while (g_main_context_iteration(context, FALSE)) {
+  }
   bool expired = false;
   GSource* limit = g_timeout_source_new(static_cast<guint>(limitMs));
   g_source_set_callback(
