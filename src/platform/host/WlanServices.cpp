@@ -233,6 +233,9 @@ class AutoWlan : public ServiceProtocol {
       try {
         return networkManager_.measure(bus);
       } catch (const BusFailure& second) {
+        const std::string absent = "org.freedesktop.DBus.Error.NameHasNoOwner";
+        if (first.errorName() == absent && second.errorName() == absent)
+          throw BusFailure(absentMessage(), absent);
         throw BusFailure(std::string("no WLAN source answered: ") + first.what() + "; " +
                          second.what());
       }
