@@ -1,5 +1,5 @@
 // lodestack-scan end to end: the built program run as a child process on
-// the host platform's scenarios.
+// the host platform's scenarios, and on services mocked on a private bus.
 #include <gtest/gtest.h>
 
 #include <fcntl.h>
@@ -21,6 +21,8 @@
 #include <vector>
 
 #include <nlohmann/json.hpp>
+
+#include "platform/MockServices.h"
 
 namespace {
 
@@ -342,6 +344,8 @@ TEST_F(ScanToolTest, BadCommandLinesAndFilesGiveOneLineAndFail) {
       {{"--interval", "soon"}, "", 2},
       {{"--kinds", "foo"}, "", 2},
       {{"--gnss", "gpsd:localhost:0"}, "", 2},
+      {{"--wlan", "iwd"}, "", 2},
+      {{"--cells", "ofono"}, "", 2},
       {{"--json", "--geolocation-request"}, "", 2},
       {{"decode"}, "", 2},
       {{"--scenario", "/nonexistent/street.json"}, "", 1},
@@ -364,6 +368,75 @@ TEST_F(ScanToolTest, BadCommandLinesAndFilesGiveOneLineAndFail) {
   const Outcome version = runTool({"--version"});
   EXPECT_EQ(0, version.exitStatus);
   EXPECT_EQ(0u, version.out.find("lodestack-scan ")) << version.out;
+}
+
+TEST_F(ScanToolTest, BusServicesReachTheOutput) {
+  using namespace lodestack::testing;
+  PrivateBus bus;  // DBUS_SYSTEM_BUS_ADDRESS reaches the tool
+  ASSERT_EQ("", bus.error());
+  auto nm = startNetworkManager(bus);
+  auto mm = startModemManager(bus);
+  ASSERT_EQ("", nm->error() + mm->error());
+  ASSERT_EQ("", setUpNetworkManager(*nm, {{"ap1", "00:1A:2B:3C:4D:5E", 77},
+                                          {"ap2", "0a:0b:0c:0d:0e:0f", 40}}));
+  ASSERT_EQ("", addModem(*mm,
+                         "ret = [{\"cell-type\": dbus.UInt32(2), \"serving\": True, "
+                         "\"operator-id\": \"24491\", \"lac\": \"1234\", \"ci\": \"5BA0\", "
+                         "\"rx-level\": dbus.UInt32(40)}, "
+                         "{\"cell-type\": dbus.UInt32(5), \"serving\": True, "
+                         "\"operator-id\": \"24491\", \"ci\": \"121E303\"}, "
+                         "{\"cell-type\": dbus.UInt32(6), \"serving\": False}]"));
+
+  const Outcome run = runTool({"--wlan", "networkmanager", "--cells", "modemmanager", "--rounds",
+                               "2", "--json", "--interval", "0"});
+  ASSERT_EQ(0, run.exitStatus) << run.err;
+  int cellular = 0, wlan = 0;
+  for (const std::string& line : linesOf(run.out)) {
+    const Json result = Json::parse(line);
+    const Json& m = result.at("measurements");
+    if (result["kind"] == "cellular") {
+      ++cellular;
+      ASSERT_EQ("Ok", result["status"]) << line;
+      const Json& gsm = m.at("geran").at(0);
+      EXPECT_EQ(244, gsm.at("mcc")) << line;
+      EXPECT_EQ(91, gsm.at("mnc")) << line;
+      EXPECT_EQ(4660, gsm.at("lac")) << line;
+      EXPECT_EQ(23456, gsm.at("cid")) << line;
+      EXPECT_EQ(18998019, m.at("eutra")[0].at("ucid")) << line;
+    } else if (result["kind"] == "wlan") {
+      ++wlan;
+      ASSERT_EQ("Ok", result["status"]) << line;
+      ASSERT_EQ(2u, m.at("wlan").size()) << line;
+      EXPECT_EQ("00:1a:2b:3c:4d:5e", m["wlan"][0].at("bssid"));
+      EXPECT_EQ(77, m["wlan"][0].at("rssi"));
+      EXPECT_FALSE(m["wlan"][0].contains("rxLevel")) << "NetworkManager gives no dBm";
+      EXPECT_EQ("0a:0b:0c:0d:0e:0f", m["wlan"][1].at("bssid"));
+    }
+  }
+  EXPECT_EQ(2, cellular);
+  EXPECT_EQ(2, wlan);
+  EXPECT_EQ("lodestack-scan: cellular request 1: skipped 1 NR and 0 CDMA cell(s): lodestack has "
+            "no records for them\n",
+            run.err)
+      << "told once";
+}
+
+// On a bus without WLAN services the first request (made before the
+// library heard from the bus) ends in the WLAN time-out, the next is refused
+// at once; the reason is said once, plainly.
+TEST_F(ScanToolTest, AutoWithoutWlanSourceSaysSo) {
+  lodestack::testing::PrivateBus bus;
+  ASSERT_EQ("", bus.error());
+  const Outcome run = runTool({"--wlan", "auto", "--kinds", "wlan", "--rounds", "2", "--interval", "0"});
+  EXPECT_EQ(0, run.exitStatus);
+  const std::vector<std::string> lines = linesOf(run.out);
+  ASSERT_EQ(2u, lines.size()) << run.out;
+  EXPECT_TRUE(lines[0] == "wlan request 1: Timeout" || lines[0] == "wlan request 0: Failed")
+      << lines[0];
+  EXPECT_EQ("wlan request 0: Failed", lines[1]) << "known absent: refused at once";
+  EXPECT_EQ("lodestack-scan: no WLAN source: neither wpa_supplicant (fi.w1.wpa_supplicant1) nor "
+            "NetworkManager (org.freedesktop.NetworkManager) is on the system bus\n",
+            run.err);
 }
 
 TEST_F(ScanToolTest, SignalsEndTheRunCleanly) {

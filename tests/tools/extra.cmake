@@ -4,3 +4,5 @@ target_link_libraries(${target} PRIVATE lodestack_scan_core)
 target_compile_definitions(${target} PRIVATE
   LODESTACK_SCAN_TOOL="$<TARGET_FILE:lodestack-scan>")
 add_dependencies(${target} lodestack-scan)
+# The run against bus services mocks them on a private bus through GDBus.
+target_link_libraries(${target} PRIVATE PkgConfig::GIO)

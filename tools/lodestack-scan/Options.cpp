@@ -11,8 +11,10 @@ namespace scan {
 namespace {
 
 const char kEnvironment[] =
-    "Environment: LODESTACK_SCENARIO=FILE and LODESTACK_GNSS=scenario|gpsd[:HOST[:PORT]] are\n"
-    "used when --scenario and --gnss are not given.\n"
+    "Environment: LODESTACK_SCENARIO=FILE, LODESTACK_GNSS=scenario|gpsd[:HOST[:PORT]],\n"
+    "LODESTACK_WLAN=scenario|wpa_supplicant|networkmanager|auto and\n"
+    "LODESTACK_CELLS=scenario|modemmanager are used when --scenario, --gnss, --wlan and\n"
+    "--cells are not given.\n"
     "Exit status: 0 done, 1 failure (platform, files, output), 2 bad command line,\n"
     "130 interrupted (SIGINT), 143 terminated (SIGTERM).";
 
@@ -77,6 +79,15 @@ int parseOptions(int argc, const char* const* argv, Options& options, std::ostre
         return validGnssSource(v) ? std::string()
                                   : "'" + v + "' is not scenario or gpsd[:HOST[:PORT]]";
       }, "");
+  app.add_option("--wlan", options.wlan,
+                 "Source of WLAN scans: the scenario or a service of the system bus "
+                 "(auto: wpa_supplicant, else NetworkManager)")
+      ->type_name("SOURCE")
+      ->check(CLI::IsMember({"scenario", "wpa_supplicant", "networkmanager", "auto"}));
+  app.add_option("--cells", options.cells,
+                 "Source of cellular measurements: the scenario or ModemManager")
+      ->type_name("SOURCE")
+      ->check(CLI::IsMember({"scenario", "modemmanager"}));
   CLI::Option* outFile =
       app.add_option("--out", options.out, "Append every result to this results file")
           ->type_name("FILE");

@@ -17,6 +17,8 @@ struct Options {
 
   std::string scenario;  // empty: LODESTACK_SCENARIO, else the built-in street
   std::string gnss;      // empty: LODESTACK_GNSS, else the scenario's track
+  std::string wlan;      // empty: LODESTACK_WLAN, else the scenario
+  std::string cells;     // empty: LODESTACK_CELLS, else the scenario
   std::string out;       // results file to append to; empty: none
   std::string store;     // --encrypt / decode --decrypt: the key's store; empty: plain
   std::string logConfig;  // debug log configuration; empty: no log

@@ -70,6 +70,8 @@ class Session : public IMeasurementsObserver {
                          gom::SharedPointer<gom::GenericObject> measurements,
                          Status status) override {
     report(Result{types, requestId, status, measurements});
+    if (types == Cellular && isUsable(status)) noteSkippedCells(requestId);
+    if (types != Gnss && !isUsable(status)) notePlatformError();
     // Request ids start at 1, so 0 never matches a pending request.
     if (types == Cellular && requestId == pendingCellular_) pendingCellular_ = 0;
     if (types == Wlan && requestId == pendingWlan_) pendingWlan_ = 0;
@@ -104,7 +106,27 @@ class Session : public IMeasurementsObserver {
 
   bool failed() const { return failed_; }
 
+  // Why the platform failed a request, once per reason: a service that is
+  // absent, refuses or answers badly, or no WLAN source at all.
+  void notePlatformError() {
+    const std::string why = platform::lastError();
+    if (why.empty() || why == lastNote_) return;
+    err_ << "lodestack-scan: " << why << "\n";
+    lastNote_ = why;
+  }
+
  private:
+  // Cells of the modem's answer that have no records (NR, CDMA), told when
+  // their number changes.
+  void noteSkippedCells(unsigned int requestId) {
+    const platform::SkippedCells skipped = platform::lastSkippedCells();
+    if (skipped.nr == skipped_.nr && skipped.cdma == skipped_.cdma) return;
+    skipped_ = skipped;
+    if (skipped.nr == 0 && skipped.cdma == 0) return;
+    err_ << "lodestack-scan: cellular request " << requestId << ": skipped " << skipped.nr
+         << " NR and " << skipped.cdma << " CDMA cell(s): lodestack has no records for them\n";
+  }
+
   void fail(const std::string& error) {
     if (!failed_) err_ << "lodestack-scan: " << error << "\n";
     failed_ = true;
@@ -117,6 +139,8 @@ class Session : public IMeasurementsObserver {
   unsigned int pendingWlan_ = 0;
   bool waitingForGnss_ = false;
   bool failed_ = false;
+  platform::SkippedCells skipped_;
+  std::string lastNote_;
 };
 
 class Scanner {
@@ -152,6 +176,7 @@ class Scanner {
     } else {
       // No result will come; the refusal stands in for it.
       session_.report(Result{kind, 0, status, gom::SharedPointer<gom::GenericObject>()});
+      session_.notePlatformError();
     }
   }
 
@@ -215,6 +240,8 @@ int runScan(const Options& options, std::ostream& out, std::ostream& err) {
     setenv("LODESTACK_SCENARIO", options.scenario.c_str(), 1);
   }
   if (!options.gnss.empty()) setenv("LODESTACK_GNSS", options.gnss.c_str(), 1);
+  if (!options.wlan.empty()) setenv("LODESTACK_WLAN", options.wlan.c_str(), 1);
+  if (!options.cells.empty()) setenv("LODESTACK_CELLS", options.cells.c_str(), 1);
 
   ResultsWriter writer;
   std::string error;
