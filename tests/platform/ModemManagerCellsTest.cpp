@@ -200,10 +200,10 @@ TEST(BusServiceChoices, UnknownChoicesAndAMissingBusAreRefused) {
   setenv("DBUS_SYSTEM_BUS_ADDRESS", "unix:path=/nonexistent/lodestack-test-bus", 1);
   {
     RadioMeasurements library;
-    std::this_thread::sleep_for(std::chrono::milliseconds(300));
     EXPECT_THROW(library.startCellMeasurements([](void*, OxelMeasurements) {}, nullptr),
                  std::runtime_error);
-    EXPECT_EQ(platform::lastError().rfind("no system bus at unix:path=/nonexistent/lodestack-test-bus: ", 0), 0u)
+    EXPECT_NE(platform::lastError().find(": no system bus at unix:path=/nonexistent/lodestack-test-bus: "),
+              std::string::npos)
         << platform::lastError();
   }
   unsetenv("DBUS_SYSTEM_BUS_ADDRESS");

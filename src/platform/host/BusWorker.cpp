@@ -1,6 +1,8 @@
 // The bus thread of a service source.
 #include "platform/host/BusWorker.h"
 
+#include <algorithm>
+
 namespace lodestack {
 namespace platform {
 namespace host {
@@ -68,9 +70,38 @@ void BusWorker::reconnect() {
   wake();
 }
 
+namespace {
+
+// Without talking to the bus: when every address of the system bus is a
+// socket file that does not exist, why there is no bus; else empty.
+std::string missingSystemBusSocket() {
+  gchar* found = g_dbus_address_get_for_bus_sync(G_BUS_TYPE_SYSTEM, nullptr, nullptr);
+  if (!found) return std::string();
+  const std::string address = found;
+  g_free(found);
+  std::size_t start = 0;
+  while (start <= address.size()) {
+    const std::size_t end = std::min(address.find(';', start), address.size());
+    const std::string entry = address.substr(start, end - start);
+    const std::string prefix = "unix:path=";
+    if (entry.rfind(prefix, 0) != 0) return std::string();  // another transport: try it
+    const std::string path = entry.substr(prefix.size(), entry.find(',') - prefix.size());
+    if (g_file_test(path.c_str(), G_FILE_TEST_EXISTS)) return std::string();
+    start = end + 1;
+  }
+  return "no system bus at " + address + ": No such file or directory";
+}
+
+}  // namespace
+
 std::string BusWorker::knownFailure() const {
   std::lock_guard<std::mutex> lock(mutex_);
-  if (!busError_.empty()) return busError_;
+  // The services' absence says what is missing; the bus's error why.
+  if (!busError_.empty()) return absentMessage_ + ": " + busError_;
+  if (!connected_) {
+    const std::string missing = missingSystemBusSocket();
+    if (!missing.empty()) return absentMessage_ + ": " + missing;
+  }
   for (const auto& watch : watches_)
     if (watch->active && watch->presence != Presence::Absent) return std::string();
   return absentMessage_;
@@ -140,6 +171,7 @@ void BusWorker::connect() {
     return;
   }
   busError_.clear();
+  connected_ = true;
   g_signal_connect(connection_, "closed", G_CALLBACK(&BusWorker::closed), this);
   for (auto& watch : watches_) {
     if (!watch->active) continue;

@@ -44,7 +44,8 @@ class BusWorker : private BusSessionHost {
   // Connects again when the connection is down.
   void reconnect();
   // Why a measurement cannot succeed now (no system bus, none of the
-  // protocol's services on it), as far as the thread knows; else empty.
+  // protocol's services on it), as far as the thread knows, or, before its
+  // first connection, as the system bus's socket file shows; else empty.
   std::string knownFailure() const;
   // The message for the running measurement if it ended now; empty when it
   // waits for nothing.
@@ -86,6 +87,7 @@ class BusWorker : private BusSessionHost {
   bool reconnect_ = false;
   bool stop_ = false;
   std::string busError_;  // why there is no connection
+  bool connected_ = false;  // a connection was made at least once
   std::vector<std::unique_ptr<Watch>> watches_;  // kept until the thread ends
   std::string unfinished_;
 
