@@ -99,16 +99,78 @@ TEST(GeolocationRequest, AccessPointsWithMacAddresses) {
     ASSERT_EQ(Ok, aps->addWlanMeasurement(m->wrappedObject()));
   }
   SharedPointer<WlanDn> quiet = WlanDn::create();
-  ASSERT_EQ(Ok, quiet->setBssid(bssid + 2, 6));
+  const unsigned char quietBssid[6] = {0x00, 0x1A, 0x2B, 0x3C, 0x4D, 0x5F};
+  ASSERT_EQ(Ok, quiet->setBssid(quietBssid, 6));
   ASSERT_EQ(Ok, aps->addWlanMeasurement(WlanMeasurement::create(quiet, 1700000000u)->wrappedObject()));
 
   // An 8-byte identifier is no MAC address; a level not measured is left out.
   EXPECT_EQ(Json::parse(R"({"cellTowers": [], "wifiAccessPoints": [
       {"macAddress": "00:1a:2b:3c:4d:5e", "signalStrength": -67},
-      {"macAddress": "2b:3c:4d:5e:6f:70"}]})"),
+      {"macAddress": "00:1a:2b:3c:4d:5f"}]})"),
             geolocationRequest(nullptr, aps));
   EXPECT_EQ(Json::parse(R"({"cellTowers": [], "wifiAccessPoints": []})"),
             geolocationRequest(nullptr, nullptr));
+}
+
+// An access point heard at -60 dBm, named `ssid` when it is not empty.
+gom::SharedPointer<gom::GenericObject> accessPoint(const unsigned char (&bssid)[6],
+                                                   const std::string& ssid) {
+  SharedPointer<WlanDn> dn = WlanDn::create();
+  EXPECT_EQ(Ok, dn->setBssid(bssid, 6));
+  if (!ssid.empty()) {
+    const SharedPointer<gom::CharacterData> name =
+        gom::CharacterData::create(ssid.data(), static_cast<unsigned int>(ssid.size()));
+    EXPECT_EQ(Ok, dn->extension()->setStringProperty(radioadaptation::ConverterOxel::kSsidProperty,
+                                                     name));
+  }
+  SharedPointer<WlanMeasurement> m = WlanMeasurement::create(dn, 1700000000u);
+  SharedPointer<WlanApMeasurement> ap = WlanApMeasurement::create();
+  (void)ap->setRxLevel(-60);
+  m->setWlanApMeasurement(ap);
+  return m->wrappedObject();
+}
+
+TEST(GeolocationRequest, OptedOutAndLocallyAdministeredAccessPointsAreLeftOut) {
+  struct Case {
+    unsigned char bssid[6];
+    const char* ssid;
+    bool sent;
+  };
+  const Case cases[] = {
+      {{0x00, 0x1A, 0x2B, 0x00, 0x00, 0x01}, "home", true},
+      {{0x00, 0x1A, 0x2B, 0x00, 0x00, 0x02}, "cafe_nomap", false},
+      {{0x00, 0x1A, 0x2B, 0x00, 0x00, 0x03}, "_nomap", false},
+      {{0x00, 0x1A, 0x2B, 0x00, 0x00, 0x04}, "_nomap_guest", true},  // not at the end
+      {{0x00, 0x1A, 0x2B, 0x00, 0x00, 0x05}, "", true},              // name unknown
+      {{0x02, 0x1A, 0x2B, 0x00, 0x00, 0x06}, "", false},             // locally administered
+      {{0xDE, 0x1A, 0x2B, 0x00, 0x00, 0x07}, "hotspot", false},      // 0xDE has the bit too
+      {{0xFC, 0x1A, 0x2B, 0x00, 0x00, 0x08}, "shop", true},          // 0xFC has not
+  };
+  SharedPointer<MeasurementContainer> aps = MeasurementContainer::create();
+  Json expected = Json::array();
+  for (const Case& c : cases) {
+    ASSERT_EQ(Ok, aps->addWlanMeasurement(accessPoint(c.bssid, c.ssid)));
+    if (c.sent) {
+      expected.push_back({{"macAddress", bssidText(c.bssid, 6)}, {"signalStrength", -60}});
+    }
+  }
+  const Json request = geolocationRequest(nullptr, aps);
+  EXPECT_EQ(expected, request["wifiAccessPoints"]);
+  EXPECT_EQ("", whyNotLocatable(request));
+}
+
+TEST(GeolocationRequest, WithoutACellTwoAccessPointsAreNeeded) {
+  const char* why = "no request sent: fewer than two access points and no cell";
+  const Json ap = {{"macAddress", "00:1a:2b:3c:4d:5e"}};
+  const Json one = Json::array({ap});
+  const Json two = Json::array({ap, ap});
+  const Json cell = {{"radioType", "gsm"}, {"cellId", 1}};
+  const Json tower = Json::array({cell});
+  const Json none = Json::array();
+  EXPECT_EQ(why, whyNotLocatable({{"cellTowers", none}, {"wifiAccessPoints", none}}));
+  EXPECT_EQ(why, whyNotLocatable({{"cellTowers", none}, {"wifiAccessPoints", one}}));
+  EXPECT_EQ("", whyNotLocatable({{"cellTowers", none}, {"wifiAccessPoints", two}}));
+  EXPECT_EQ("", whyNotLocatable({{"cellTowers", tower}, {"wifiAccessPoints", none}}));
 }
 
 }  // namespace

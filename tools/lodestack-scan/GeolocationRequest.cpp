@@ -5,12 +5,19 @@
 #include <string>
 #include <utility>
 
+#include <lodestack/gom/CharacterData.h>
+#include <lodestack/radioadaptation/ConverterOxel.h>
+#include <lodestack/schema/Wlan.h>
+
 namespace lodestack {
 namespace scan {
 namespace {
 
 using gom::SharedPointer;
 using schema::MeasurementContainer;
+using schema::WlanApMeasurement;
+using schema::WlanDn;
+using schema::WlanMeasurement;
 
 std::optional<long long> number(const Json& object, const char* key) {
   const auto it = object.find(key);
@@ -117,6 +124,64 @@ Json treeOf(const SharedPointer<MeasurementContainer>& container) {
   return container ? measurementTree(container->wrappedObject()) : Json::object();
 }
 
+template <class R>
+const R& required(const SharedPointer<R>& record) {
+  if (!record) throw WrongObjectType;
+  return *record;
+}
+
+// The network name the measurement source attached to the identity; empty
+// when it did not know it.
+std::string ssidOf(const WlanDn& dn) {
+  SharedPointer<gom::CharacterData> ssid;
+  const SharedPointer<gom::GenericObject>& extension = dn.extensionReference();
+  if (!extension ||
+      extension->getStringProperty(radioadaptation::ConverterOxel::kSsidProperty, ssid) != Ok ||
+      !ssid) {
+    return std::string();
+  }
+  return std::string(ssid->data(), ssid->length());
+}
+
+// What the services ask clients to leave out: networks whose owners opted
+// out by a name ending in "_nomap", and locally administered addresses
+// (second-lowest bit of the first byte), which are random or reassigned
+// and locate nothing.
+bool optedOut(const unsigned char* mac, const std::string& ssid) {
+  static const std::string kOptOut = "_nomap";
+  const bool noMap = ssid.size() >= kOptOut.size() &&
+                     ssid.compare(ssid.size() - kOptOut.size(), kOptOut.size(), kOptOut) == 0;
+  return noMap || (mac[0] & 0x02) != 0;
+}
+
+// Read from the records rather than the measurement tree: the network name
+// lives in the identity's in-memory extension, which the tree leaves out.
+Json accessPoints(const SharedPointer<MeasurementContainer>& wlan) {
+  Json list = Json::array();
+  if (!wlan || !wlan->valueExists(MeasurementContainer::Wlan)) return list;
+  const SharedPointer<gom::ValueCollection> items = wlan->wlanMeasurementCollection();
+  for (unsigned int i = 0; i < required(items).size(); ++i) {
+    const SharedPointer<WlanMeasurement> m =
+        WlanMeasurement::create(MeasurementContainer::collectionItem(items, i));
+    if (!m) throw WrongObjectType;
+    if (!m->valueExists(WlanMeasurement::kDn)) continue;
+    const WlanDn& dn = required(m->dn());
+    unsigned int length = 0;
+    const unsigned char* mac = dn.getBssid(length);
+    if (length != 6 || optedOut(mac, ssidOf(dn))) continue;  // 8 bytes: no MAC address
+    Json entry = Json::object();
+    entry["macAddress"] = bssidText(mac, length);
+    if (m->valueExists(WlanMeasurement::kWlanApMeasurement)) {
+      const WlanApMeasurement& ap = required(m->wlanApMeasurement());
+      if (ap.valueExists(WlanApMeasurement::RxLevel)) {
+        entry["signalStrength"] = int(ap.rxLevel());  // dBm
+      }
+    }
+    list.push_back(std::move(entry));
+  }
+  return list;
+}
+
 }  // namespace
 
 Json geolocationRequest(const SharedPointer<MeasurementContainer>& cellular,
@@ -131,24 +196,31 @@ Json geolocationRequest(const SharedPointer<MeasurementContainer>& cellular,
     }
   }
 
-  Json accessPoints = Json::array();
-  const Json aps = treeOf(wlan);
-  const auto list = aps.find("wlan");
-  if (list != aps.end()) {
-    for (const Json& ap : *list) {
-      const auto bssid = ap.find("bssid");
-      if (bssid == ap.end() || bssid->get<std::string>().size() != 17) continue;  // 6 bytes
-      Json entry = Json::object();
-      entry["macAddress"] = *bssid;
-      if (ap.contains("rxLevel")) entry["signalStrength"] = ap["rxLevel"];  // dBm
-      accessPoints.push_back(std::move(entry));
-    }
-  }
-
   Json request = Json::object();
   request["cellTowers"] = towers.take();
-  request["wifiAccessPoints"] = std::move(accessPoints);
+  request["wifiAccessPoints"] = accessPoints(wlan);
   return request;
+}
+
+std::string whyNotLocatable(const Json& request) {
+  if (!request["cellTowers"].empty() || request["wifiAccessPoints"].size() >= 2) {
+    return std::string();
+  }
+  return "no request sent: fewer than two access points and no cell";
+}
+
+void RoundMeasurements::take(const Result& result) {
+  const bool kept = result.kind == IMeasurementsObserver::Cellular ||
+                    result.kind == IMeasurementsObserver::Wlan;
+  if (!kept || !isUsable(result.status) || !result.measurements) return;
+  SharedPointer<MeasurementContainer> container = MeasurementContainer::create(result.measurements);
+  if (!container) throw WrongObjectType;
+  (result.kind == IMeasurementsObserver::Cellular ? cellular_ : wlan_) = std::move(container);
+}
+
+void RoundMeasurements::clear() {
+  cellular_ = nullptr;
+  wlan_ = nullptr;
 }
 
 }  // namespace scan

@@ -9,8 +9,7 @@
 
 #include <ostream>
 
-#include <lodestack/schema/MeasurementContainer.h>
-
+#include "GeolocationRequest.h"
 #include "ResultPrinter.h"
 
 namespace lodestack {
@@ -33,8 +32,7 @@ class GeolocationPrinter : public ResultPrinter {
 
  private:
   std::ostream& out_;
-  gom::SharedPointer<schema::MeasurementContainer> cellular_;
-  gom::SharedPointer<schema::MeasurementContainer> wlan_;
+  RoundMeasurements round_;
 };
 
 }  // namespace scan
