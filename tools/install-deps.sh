@@ -5,7 +5,7 @@ set -eu
 packages="cmake ninja-build g++ clang libclang-rt-14-dev pkg-config binutils
   libglib2.0-dev libssl-dev libgtest-dev libgmock-dev libbenchmark-dev
   libprotobuf-dev protobuf-compiler libgeographiclib-dev
-  nlohmann-json3-dev libgps-dev gpsd gpsd-clients libcli11-dev time openssl
+  nlohmann-json3-dev libgps-dev gpsd gpsd-clients libcli11-dev libcurl4-openssl-dev time openssl
   dbus-daemon python3-dbusmock"
 missing=""
 for p in $packages; do

@@ -2,6 +2,7 @@
 
 #include <climits>
 #include <cstdlib>
+#include <cstring>
 #include <vector>
 
 #include <CLI/CLI.hpp>
@@ -12,9 +13,9 @@ namespace {
 
 const char kEnvironment[] =
     "Environment: LODESTACK_SCENARIO=FILE, LODESTACK_GNSS=scenario|gpsd[:HOST[:PORT]],\n"
-    "LODESTACK_WLAN=scenario|wpa_supplicant|networkmanager|auto and\n"
-    "LODESTACK_CELLS=scenario|modemmanager are used when --scenario, --gnss, --wlan and\n"
-    "--cells are not given.\n"
+    "LODESTACK_WLAN=scenario|wpa_supplicant|networkmanager|auto,\n"
+    "LODESTACK_CELLS=scenario|modemmanager and LODESTACK_GEOLOCATION_KEY=KEY are used when\n"
+    "--scenario, --gnss, --wlan, --cells and --locate-key are not given.\n"
     "Exit status: 0 done, 1 failure (platform, files, output), 2 bad command line,\n"
     "130 interrupted (SIGINT), 143 terminated (SIGTERM).";
 
@@ -24,6 +25,23 @@ std::string checkCount(const std::string& value) {
                       value.find_first_not_of("0123456789") == std::string::npos;
   if (digits && std::strtoll(value.c_str(), nullptr, 10) <= INT_MAX) return std::string();
   return "'" + value + "' is not a whole number of 0 or more";
+}
+
+// A number of seconds above 0, up to an hour.
+std::string checkSeconds(const std::string& value) {
+  char* end = nullptr;
+  const double seconds = std::strtod(value.c_str(), &end);
+  if (!value.empty() && *end == '\0' && seconds > 0 && seconds <= 3600) return std::string();
+  return "'" + value + "' is not a number of seconds above 0 and up to 3600";
+}
+
+std::string checkServiceUrl(const std::string& value) {
+  for (const char* scheme : {"http://", "https://"}) {
+    if (value.compare(0, std::strlen(scheme), scheme) == 0 && value.size() > std::strlen(scheme)) {
+      return std::string();
+    }
+  }
+  return "'" + value + "' is not an http:// or https:// URL";
 }
 
 int kindBit(const std::string& name) {
@@ -103,6 +121,18 @@ int parseOptions(int argc, const char* const* argv, Options& options, std::ostre
                "One geolocation web-service request (JSON) per round instead of the results")
       ->excludes(json);
 
+  app.add_option("--locate", options.locateUrl,
+                 "Post each round's geolocation request to this service and print its position")
+      ->type_name("URL")
+      ->check(checkServiceUrl, "");
+  app.add_option("--locate-key", options.locateKey, "Key for the service (added as key=KEY)")
+      ->type_name("KEY");
+  app.add_option("--locate-timeout", options.locateTimeoutS,
+                 "Seconds to wait for the service's answer")
+      ->type_name("SECONDS")
+      ->check(checkSeconds, "")
+      ->capture_default_str();
+
   CLI::App* decode = app.add_subcommand("decode", "Print a results file written by --out");
   decode->add_option("FILE", options.decodePath, "Results file")->type_name("FILE")->required();
   decode->add_flag("--json", options.json, "One JSON object per result and line");
@@ -119,6 +149,8 @@ int parseOptions(int argc, const char* const* argv, Options& options, std::ostre
     return ExitUsage;
   }
   options.decode = decode->parsed();
+  const char* key = std::getenv("LODESTACK_GEOLOCATION_KEY");
+  if (options.locateKey.empty() && key) options.locateKey = key;
   options.kinds = 0;
   for (const std::string& kind : kinds) options.kinds |= kindBit(kind);
   if (options.kinds == 0) {

@@ -28,6 +28,11 @@ struct Options {
   int intervalMs = 1000;    // pause between rounds
   bool json = false;
   bool geolocation = false;
+  // --locate: the geolocation service each round's request is posted to;
+  // empty: none. The key is --locate-key, else LODESTACK_GEOLOCATION_KEY.
+  std::string locateUrl;
+  std::string locateKey;
+  double locateTimeoutS = 10;
 };
 
 // Exit statuses of the tool.

@@ -18,6 +18,7 @@
 #include <lodestack/platform/HostPlatform.h>
 #include <lodestack/radioadaptation/RadioAdaptationFactory.h>
 
+#include "Locator.h"
 #include "ResultPrinter.h"
 #include "ResultsFile.h"
 
@@ -63,8 +64,8 @@ class SignalHandlers {
 // requests are all answered.
 class Session : public IMeasurementsObserver {
  public:
-  Session(ResultPrinter& printer, ResultsWriter* writer, std::ostream& err)
-      : printer_(printer), writer_(writer), err_(err) {}
+  Session(ResultPrinter& printer, ResultsWriter* writer, Locator* locator, std::ostream& err)
+      : printer_(printer), writer_(writer), locator_(locator), err_(err) {}
 
   void measurementsReady(unsigned int requestId, int types,
                          gom::SharedPointer<gom::GenericObject> measurements,
@@ -81,6 +82,7 @@ class Session : public IMeasurementsObserver {
   void report(const Result& result) {
     try {
       printer_.print(result);
+      if (locator_) locator_->take(result);
     } catch (Status) {
       const char* kind = kindName(result.kind);
       fail(std::string("a ") + (kind ? kind : "measurement") + " result is not a measurement tree");
@@ -134,6 +136,7 @@ class Session : public IMeasurementsObserver {
 
   ResultPrinter& printer_;
   ResultsWriter* writer_;
+  Locator* locator_;
   std::ostream& err_;
   unsigned int pendingCellular_ = 0;
   unsigned int pendingWlan_ = 0;
@@ -146,8 +149,12 @@ class Session : public IMeasurementsObserver {
 class Scanner {
  public:
   Scanner(const Options& options, core::IAsyncCallDispatcher& dispatcher,
-          MeasurementsProvider& provider, Session& session)
-      : options_(options), dispatcher_(dispatcher), provider_(provider), session_(session) {}
+          MeasurementsProvider& provider, Session& session, Locator* locator)
+      : options_(options),
+        dispatcher_(dispatcher),
+        provider_(provider),
+        session_(session),
+        locator_(locator) {}
 
   void run() {
     for (int round = 1; going(); ++round) {
@@ -159,6 +166,8 @@ class Scanner {
       while (going() && !session_.roundDone()) dispatcher_.sleep(kSliceMs);
       if (!going()) return;
       session_.endRound();
+      if (locator_) locate(*locator_);
+      if (!going()) return;
       if (options_.rounds != 0 && round >= options_.rounds) return;
       pause(std::chrono::milliseconds(options_.intervalMs));
     }
@@ -180,6 +189,14 @@ class Scanner {
     }
   }
 
+  // The round's request to the geolocation service; the loop keeps turning
+  // until its answer, bounded by the service's time-out.
+  void locate(Locator& locator) {
+    locator.start(dispatcher_);
+    while (going() && locator.busy()) dispatcher_.sleep(kSliceMs);
+    locator.finish();
+  }
+
   // Keeps the loop turning (GNSS fixes arrive meanwhile) for `duration`.
   void pause(std::chrono::milliseconds duration) {
     const Clock::time_point end = Clock::now() + duration;
@@ -194,6 +211,7 @@ class Scanner {
   core::IAsyncCallDispatcher& dispatcher_;
   MeasurementsProvider& provider_;
   Session& session_;
+  Locator* locator_;
 };
 
 }  // namespace
@@ -267,14 +285,16 @@ int runScan(const Options& options, std::ostream& out, std::ostream& err) {
     const std::string why = platform::lastError();
     return failWith(why.empty() ? "the radio adaptation could not be made" : why);
   }
-  Session session(*printer, options.out.empty() ? nullptr : &writer, err);
+  const std::unique_ptr<Locator> locator(
+      options.locateUrl.empty() ? nullptr : new Locator(options, out, err));
+  Session session(*printer, options.out.empty() ? nullptr : &writer, locator.get(), err);
   {
     // Destroyed before the adaptation: unsubscribes and cancels what is
     // pending.
     const std::unique_ptr<MeasurementsProvider> provider(MeasurementsProvider::create(*radio));
     if (!provider) return failWith("the measurements provider could not be made");
     provider->addObserver(session, options.kinds);
-    Scanner(options, *dispatcher, *provider, session).run();
+    Scanner(options, *dispatcher, *provider, session, locator.get()).run();
   }
   writer.close();
   if (caughtSignal) return 128 + caughtSignal;
