@@ -2,147 +2,21 @@
 // the host platform's scenarios, and on services mocked on a private bus.
 #include <gtest/gtest.h>
 
-#include <fcntl.h>
-#include <poll.h>
 #include <signal.h>
 #include <sys/stat.h>
-#include <sys/wait.h>
-#include <unistd.h>
 
 #include <algorithm>
 #include <cctype>
-#include <chrono>
-#include <cstdio>
-#include <fstream>
-#include <iterator>
-#include <sstream>
 #include <string>
 #include <utility>
 #include <vector>
 
-#include <nlohmann/json.hpp>
-
+#include "ToolProcess.h"
 #include "platform/MockServices.h"
 
 namespace {
 
-using Json = nlohmann::json;
-using Clock = std::chrono::steady_clock;
-using Args = std::vector<std::string>;
-
-struct Outcome {
-  int exitStatus = -1;  // -1 when the child did not exit normally
-  std::string out;
-  std::string err;
-};
-
-// The tool running as a child, its output collected through pipes. Only
-// LODESTACK_SCENARIO reaches it of the host platform's variables.
-class Tool {
- public:
-  explicit Tool(const Args& args, const std::string& scenario = std::string()) {
-    int out[2], err[2];
-    if (pipe2(out, O_CLOEXEC) != 0 || pipe2(err, O_CLOEXEC) != 0) return;
-    pid_ = fork();
-    if (pid_ == 0) {
-      dup2(out[1], 1);
-      dup2(err[1], 2);
-      unsetenv("LODESTACK_GNSS");
-      if (scenario.empty()) unsetenv("LODESTACK_SCENARIO");
-      else setenv("LODESTACK_SCENARIO", scenario.c_str(), 1);
-      std::vector<char*> argv{const_cast<char*>(LODESTACK_SCAN_TOOL)};
-      for (const std::string& a : args) argv.push_back(const_cast<char*>(a.c_str()));
-      argv.push_back(nullptr);
-      execv(argv[0], argv.data());
-      _exit(127);
-    }
-    close(out[1]);
-    close(err[1]);
-    out_ = out[0];
-    err_ = err[0];
-  }
-  ~Tool() {
-    if (pid_ > 0 && !reaped_) {
-      kill(pid_, SIGKILL);
-      waitpid(pid_, nullptr, 0);
-    }
-    if (out_ >= 0) close(out_);
-    if (err_ >= 0) close(err_);
-  }
-
-  // Collects output until stdout holds `lines` lines or the child closed it.
-  bool waitForLines(std::size_t lines) {
-    while (std::count(outcome_.out.begin(), outcome_.out.end(), '\n') < static_cast<long>(lines)) {
-      if (!pump()) return false;
-    }
-    return true;
-  }
-  void signal(int number) { kill(pid_, number); }
-
-  // Everything the child writes, and how it ended.
-  Outcome finish() {
-    while (pump()) {
-    }
-    int status = 0;
-    if (waitpid(pid_, &status, 0) == pid_ && WIFEXITED(status)) {
-      outcome_.exitStatus = WEXITSTATUS(status);
-    }
-    reaped_ = true;
-    return outcome_;
-  }
-
- private:
-  // One read from whichever pipe is ready; false once both are closed or the
-  // child has run far too long.
-  bool pump() {
-    if (Clock::now() > deadline_) {
-      ADD_FAILURE() << "lodestack-scan ran too long";
-      return false;
-    }
-    pollfd fds[2] = {{out_, POLLIN, 0}, {err_, POLLIN, 0}};
-    if (out_ < 0 && err_ < 0) return false;
-    if (poll(fds, 2, 1000) <= 0) return true;
-    for (int i = 0; i < 2; ++i) {
-      if (!fds[i].revents) continue;
-      int& fd = i == 0 ? out_ : err_;
-      char buffer[4096];
-      const ssize_t n = read(fd, buffer, sizeof buffer);
-      if (n > 0) {
-        (i == 0 ? outcome_.out : outcome_.err).append(buffer, static_cast<std::size_t>(n));
-      } else {
-        close(fd);
-        fd = -1;
-      }
-    }
-    return true;
-  }
-
-  pid_t pid_ = -1;
-  int out_ = -1;
-  int err_ = -1;
-  bool reaped_ = false;
-  Outcome outcome_;
-  const Clock::time_point deadline_ = Clock::now() + std::chrono::seconds(120);
-};
-
-Outcome runTool(const Args& args, const std::string& scenario = std::string()) {
-  return Tool(args, scenario).finish();
-}
-
-std::vector<std::string> linesOf(const std::string& text) {
-  std::vector<std::string> lines;
-  std::istringstream in(text);
-  for (std::string line; std::getline(in, line);) lines.push_back(line);
-  return lines;
-}
-
-std::string readFile(const std::string& path) {
-  std::ifstream in(path, std::ios::binary);
-  return std::string(std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>());
-}
-void writeFile(const std::string& path, const std::string& bytes) {
-  std::ofstream(path, std::ios::binary | std::ios::trunc) << bytes;
-}
+using namespace tooltest;
 
 // Where each record of a results file starts.
 std::vector<std::size_t> recordOffsets(const std::string& bytes) {
@@ -155,20 +29,7 @@ std::vector<std::size_t> recordOffsets(const std::string& bytes) {
   return offsets;
 }
 
-class ScanToolTest : public ::testing::Test {
- protected:
-  void TearDown() override {
-    for (const std::string& f : files_) std::remove(f.c_str());
-  }
-  std::string tempFile(const std::string& name) {
-    files_.push_back(::testing::TempDir() + "scan_" + std::to_string(getpid()) + "_" + name);
-    std::remove(files_.back().c_str());
-    return files_.back();
-  }
-
- private:
-  std::vector<std::string> files_;
-};
+using ScanToolTest = ToolTest;
 
 // Whether `text` follows `shape`, where 'd' stands for a decimal digit and
 // 'x' for a lower-case hex digit.
