@@ -46,25 +46,31 @@ void Variant::operator delete(void* block, std::size_t size) noexcept {
 
 Variant::Variant(unsigned short key, const Variant& v) : Variant(v) { key_ = key; }
 
+// The source may live inside the object this variant releases (a property
+// of the held generic object): everything is read from it first.
 Variant& Variant::operator=(const Variant& v) {
   if (this == &v) return *this;
   if (v.holdsObject() && v.object_) v.object_->increment();
-  releaseObject();
-  key_ = v.key_;
-  type_ = v.type_;
-  bits_ = v.bits_;
+  replace(v.key_, v.type_, v.bits_);
   return *this;
 }
 
 Variant& Variant::operator=(Variant&& v) noexcept {
   if (this == &v) return *this;
-  releaseObject();
-  key_ = v.key_;
-  type_ = v.type_;
-  bits_ = v.bits_;
+  const unsigned short key = v.key_, type = v.type_;
+  const unsigned long long bits = v.bits_;
   v.type_ = TypeEmpty;
   v.bits_ = 0;
+  replace(key, type, bits);
   return *this;
+}
+
+void Variant::replace(unsigned short key, unsigned short type, unsigned long long bits) {
+  ReferenceCountable* old = holdsObject() ? object_ : nullptr;
+  key_ = key;
+  type_ = type;
+  bits_ = bits;
+  if (old) old->decrement();
 }
 
 Variant* Variant::create() { return new (std::nothrow) Variant(); }
@@ -99,15 +105,12 @@ Status Variant::cloneFrom(const Variant& v) {
     }
     if (!copy) return OutOfMemory;
   }
-  releaseObject();
-  key_ = v.key_;
-  type_ = v.type_;
+  unsigned long long bits = v.bits_;
   if (copy) {
-    bits_ = 0;
-    object_ = copy;  // the reference detached from the clone's handle
-  } else {
-    bits_ = v.bits_;
+    bits = 0;
+    std::memcpy(&bits, &copy, sizeof copy);  // the reference detached from the clone's handle
   }
+  replace(v.key_, v.type_, bits);
   return Ok;
 }
 

@@ -53,5 +53,39 @@ TEST(SharedPointer, CountsConvertsAndCasts) {
   EXPECT_EQ(destroyed, 2);
 }
 
+// A list node that owns the next one.
+struct Node : Probe {
+  using Probe::Probe;
+  SharedPointer<Node> next;
+};
+
+// Popping a list assigns a handle from a member of the object it releases.
+TEST(SharedPointer, AssignmentFromAMemberOfTheOldPointee) {
+  int destroyed = 0;
+  SharedPointer<Node> head;
+  for (int i = 0; i < 4; ++i) {
+    SharedPointer<Node> node(new Node(&destroyed));
+    node->next = head;
+    head = node;
+  }
+  head = head->next;
+  EXPECT_EQ(destroyed, 1) << "only the old head goes";
+  EXPECT_EQ(head->referenceCount(), 1);
+  head = std::move(head->next);
+  EXPECT_EQ(destroyed, 2);
+  EXPECT_EQ(head->referenceCount(), 1);
+
+  // The handle assigned to may itself live inside the object it releases:
+  // in a two-node cycle, the last node's handle releases the first, which
+  // holds the last.
+  head->next->next = head;
+  Node* last = head->next.get();
+  head.clear();
+  SharedPointer<Node> spare(new Node(&destroyed));
+  last->next = spare;
+  EXPECT_EQ(destroyed, 4);
+  EXPECT_EQ(spare->referenceCount(), 1);
+}
+
 }  // namespace
 }  // namespace lodestack::gom

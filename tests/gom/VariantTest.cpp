@@ -1,4 +1,5 @@
 #include <cmath>
+#include <functional>
 #include <limits>
 
 #include <gtest/gtest.h>
@@ -81,6 +82,30 @@ TEST(Variant, CopiesShareAndClonesCopy) {
   v = Variant();
   holder = Variant();
   EXPECT_EQ(inner->referenceCount(), 1);
+}
+
+// A variant that holds the last reference to an object is assigned one of
+// that object's properties: copy, move and deep copy read it before the
+// object goes (ASan and valgrind watch).
+TEST(Variant, AssignedFromInsideTheObjectItReleases) {
+  const std::function<void(Variant&, Variant&)> forms[] = {
+      [](Variant& to, Variant& from) { to = from; },
+      [](Variant& to, Variant& from) { to = std::move(from); },
+      [](Variant& to, Variant& from) { EXPECT_EQ(to.cloneFrom(from), Ok); }};
+  for (const auto& assign : forms) {
+    SharedPointer<GenericObject> object = GenericObject::create(5);
+    ASSERT_EQ(object->setStringProperty(7, CharacterData::create("abc", 3)), Ok);
+    Variant v(1);
+    ASSERT_EQ(v.setGenericObjectValue(object), Ok);
+    InternalVariant* property = object->findProperty(7);
+    object.clear();
+    assign(v, *property);
+    SharedPointer<CharacterData> text;
+    EXPECT_EQ(v.key(), 7);
+    ASSERT_EQ(v.getStringValue(text), Ok);
+    EXPECT_STREQ(text->data(), "abc");
+    EXPECT_EQ(text->referenceCount(), 2) << "held by the variant and here";
+  }
 }
 
 TEST(ValueCollection, OrderedEqualityCloneAndRemoval) {

@@ -38,22 +38,22 @@ class ObjectHandle {
     if (ptr_) ptr_->decrement();
   }
 
-  // Same handle: nothing. Otherwise the old pointee is released first, then
-  // the source's pointee (if any) is taken with count + 1.
+  // Same handle: nothing. Otherwise the source's pointee (if any) is taken
+  // with count + 1 and then the old pointee is released. The source is read
+  // first because it may live inside the old pointee (`head = head->next`),
+  // and the handle is set before the release because it may, too.
   ObjectHandle& operator=(const ObjectHandle& other) {
     if (this == &other) return *this;
-    release();
-    if (other.ptr_) {
-      other.ptr_->increment();
-      ptr_ = other.ptr_;
-    }
+    T* fresh = other.ptr_;
+    if (fresh) fresh->increment();
+    replace(fresh);
     return *this;
   }
   ObjectHandle& operator=(ObjectHandle&& other) noexcept {
     if (this != &other) {
-      release();
-      ptr_ = other.ptr_;
+      T* fresh = other.ptr_;
       other.ptr_ = nullptr;
+      replace(fresh);
     }
     return *this;
   }
@@ -67,6 +67,13 @@ class ObjectHandle {
       ptr_ = nullptr;
       old->decrement();
     }
+  }
+  // Holds `fresh` (whose reference the caller already took), then releases
+  // the old pointee.
+  void replace(T* fresh) {
+    T* old = ptr_;
+    ptr_ = fresh;
+    if (old) old->decrement();
   }
   T* ptr_;
 };

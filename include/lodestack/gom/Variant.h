@@ -143,6 +143,9 @@ class LODESTACK_EXPORT Variant : public ISerializable {
   template <class T>
   Status getScalar(unsigned short code, T& v) const;
   Status setHeld(unsigned short code, ReferenceCountable* object);
+  // Takes new contents whose reference is already held, then releases the
+  // old object.
+  void replace(unsigned short key, unsigned short type, unsigned long long bits);
   template <class T>
   Status getHeld(unsigned short code, SharedPointer<T>& out) const;
 
