@@ -1,5 +1,7 @@
-// Counts, per thread, how deeply the reader is inside nested objects, so
-// that hostile input cannot exhaust the stack.
+// Counts, per thread, how deeply the reader, the writer, cloning or
+// comparison is inside the objects held by variants, so that hostile input
+// or an object that holds itself cannot exhaust the stack. All four count
+// the same levels, so whatever the writer accepts the reader reads back.
 #ifndef LODESTACK_SRC_GOM_NESTINGGUARD_H
 #define LODESTACK_SRC_GOM_NESTINGGUARD_H
 

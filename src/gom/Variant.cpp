@@ -89,6 +89,8 @@ Status Variant::cloneFrom(const Variant& v) {
   if (this == &v) return Ok;
   ReferenceCountable* copy = nullptr;
   if (v.holdsObject() && v.object_) {
+    NestingGuard guard;
+    if (!guard.ok()) return InvalidArgument;
     switch (v.type_) {
       case TypeString:
         copy = held<CharacterData>(v.object_)->clone().detach();
@@ -119,6 +121,8 @@ bool Variant::operator==(const Variant& v) const {
   if (!holdsObject()) return bits_ == v.bits_;
   if (!object_ || !v.object_) return object_ == v.object_;
   if (object_ == v.object_) return true;
+  NestingGuard guard;
+  if (!guard.ok()) return false;
   switch (type_) {
     case TypeString:
       return *held<CharacterData>(object_) == *held<CharacterData>(v.object_);
@@ -260,6 +264,8 @@ bool Variant::write(IStream& stream) const {
     if (stream.write(record, 4 + width) != 4 + width) return false;
     return stream.good();
   }
+  NestingGuard guard;
+  if (!guard.ok()) return false;
   if (type_ == TypeString) {
     // A variant holding no string writes an empty one.
     const CharacterData* text = held<CharacterData>(object_);

@@ -203,5 +203,59 @@ TEST(GenericObject, NestingIsBounded) {
       << "deep input fails instead of exhausting the stack";
 }
 
+// The object tree of nestedObjects(depth); the innermost object may hold a
+// string, one level deeper still.
+SharedPointer<GenericObject> nestedTree(int depth, bool text = false) {
+  SharedPointer<GenericObject> object = GenericObject::create(1);
+  if (text) {
+    EXPECT_EQ(object->setStringProperty(2, CharacterData::create("x", 1)), Ok);
+  }
+  for (int i = 0; i < depth; ++i) {
+    SharedPointer<GenericObject> outer = GenericObject::create(1);
+    EXPECT_EQ(outer->setGenericObjectProperty(1, object), Ok);
+    object = outer;
+  }
+  return object;
+}
+
+// Writing, cloning and comparing stop where reading stops, so a cycle or
+// a too deep tree cannot exhaust the stack, and whatever is written reads
+// back equal.
+TEST(GenericObject, WritingCloningAndComparingAreBoundedLikeReading) {
+  constexpr int kMax = Variant::kMaxNestingDepth;
+  for (bool text : {false, true}) {
+    const int depth = text ? kMax - 1 : kMax;  // a string is a level of its own
+    SharedPointer<GenericObject> deepest = nestedTree(depth, text);
+    const Bytes bytes = serialise(*deepest);
+    if (!text) {
+      EXPECT_EQ(bytes, nestedObjects(kMax));
+    }
+    SharedPointer<GenericObject> back = readObject(bytes);
+    ASSERT_TRUE(back) << "depth " << depth;
+    EXPECT_EQ(*back, *deepest);
+    SharedPointer<GenericObject> copy = deepest->clone();
+    ASSERT_TRUE(copy);
+    EXPECT_EQ(*copy, *deepest);
+
+    SharedPointer<GenericObject> deeper = nestedTree(depth + 1, text);
+    BufferStream out;
+    EXPECT_FALSE(deeper->write(out)) << "the reader would refuse depth " << depth + 1;
+    EXPECT_FALSE(deeper->clone());
+    EXPECT_NE(*deeper, *nestedTree(depth + 1, text)) << "too deep to tell";
+  }
+
+  // An object that holds itself is accepted (and would leak); walking it
+  // ends at the same depth.
+  SharedPointer<GenericObject> loop = GenericObject::create(1), other = GenericObject::create(1);
+  ASSERT_EQ(loop->setGenericObjectProperty(1, loop), Ok);
+  ASSERT_EQ(other->setGenericObjectProperty(1, other), Ok);
+  BufferStream out;
+  EXPECT_FALSE(loop->write(out));
+  EXPECT_FALSE(loop->clone());
+  EXPECT_NE(*loop, *other);
+  EXPECT_EQ(*loop, *loop) << "the same object compares equal at once";
+  ASSERT_TRUE(loop->removeProperty(1) && other->removeProperty(1));  // no leak
+}
+
 }  // namespace
 }  // namespace lodestack::gom

@@ -11,8 +11,10 @@
 // Byte format (little-endian): 2-byte key, 4-byte property count, then the
 // variant records. read() replaces key and properties whole or leaves the
 // object as it was; a key of 0 ends the read at once, without touching the
-// object (writers never use key 0). Nesting in bytes read is bounded by
-// Variant::kMaxNestingDepth.
+// object (writers never use key 0). Nesting is bounded by
+// Variant::kMaxNestingDepth in reading, writing, clone() and ==, so an object
+// that holds itself (never detected; it leaks) fails to write and clones to
+// null, and == answers false where it would have to look deeper.
 //
 // Objects are reference counted (see SharedPointer) and belong to one thread
 // at a time. Factories return null when memory is exhausted.

@@ -10,6 +10,12 @@
 // Equality compares key, kind, and then objects by content and scalars by
 // their 8-byte image (so float NaNs with one bit pattern are equal and +0 and
 // -0 are not). Not thread-safe.
+//
+// Objects held inside held objects nest at most kMaxNestingDepth levels deep
+// for every operation that walks them: deeper (or cyclic: an object holding
+// itself, which is never detected) trees fail write(), make clone() null and
+// cloneFrom() InvalidArgument, and == answers false where it would have to
+// look deeper.
 #ifndef LODESTACK_GOM_VARIANT_H
 #define LODESTACK_GOM_VARIANT_H
 
@@ -78,7 +84,8 @@ class LODESTACK_EXPORT Variant : public ISerializable {
   // A deep copy on the heap, owned by the caller; null on failure.
   Variant* clone() const;
   // Deep assignment: like operator= but the held object is cloned. Status
-  // OutOfMemory (variant unchanged) when the clone cannot be made.
+  // OutOfMemory (variant unchanged) when the clone cannot be made, and
+  // InvalidArgument when it nests too deeply (see above).
   Status cloneFrom(const Variant& v);
 
   unsigned short key() const { return key_; }
@@ -121,7 +128,9 @@ class LODESTACK_EXPORT Variant : public ISerializable {
   Status getObjectValue(SharedPointer<ObjectBase>& v) const;
   Status getCollectionValue(SharedPointer<ValueCollection>& v) const;
 
-  // Variant record: 2-byte code, 2-byte key, payload by code.
+  // Variant record: 2-byte code, 2-byte key, payload by code. False when the
+  // stream refuses bytes or the objects nest too deeply; what was written
+  // stays in the stream.
   bool write(IStream& stream) const override;
   // Reads a variant record. On failure the variant is left as it was. Objects
   // nest at most kMaxNestingDepth levels deep; deeper input fails the read.
