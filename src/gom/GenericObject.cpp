@@ -4,6 +4,7 @@
 #include <cstring>
 #include <new>
 
+#include "gom/Reservation.h"
 #include "lodestack/gom/CharacterData.h"
 #include "lodestack/gom/ObjectBase.h"
 #include "lodestack/gom/ValueCollection.h"
@@ -13,7 +14,6 @@ namespace lodestack {
 namespace gom {
 
 namespace {
-const unsigned int kSmallCount = 64;
 using Pool = NodePool<sizeof(GenericObject)>;
 }  // namespace
 
@@ -253,15 +253,9 @@ bool GenericObject::read(IStream& stream) {
   unsigned int count = 0;
   if (!stream.readUint32(count)) return false;
   // The properties go to a fresh store that replaces the old one only when
-  // everything was read. Every property takes at least 4 bytes: beyond a
-  // small count, reserve no more than the stream can hold, so a forged count
-  // costs nothing before its bytes are there.
+  // everything was read.
   PropertyStore fresh;
-  unsigned int plausible = count;
-  if (count > kSmallCount) {
-    const unsigned int left = stream.bytesLeftHint();
-    plausible = left / 4 < count ? left / 4 : count;
-  }
+  const unsigned int plausible = plausibleItems(stream, count);
   try {
     fresh.reserve(plausible < 4096 ? plausible : 4096);
   } catch (const std::bad_alloc&) {

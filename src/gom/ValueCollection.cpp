@@ -1,5 +1,6 @@
 #include "lodestack/gom/ValueCollection.h"
 
+#include "gom/Reservation.h"
 #include "lodestack/stream/IStream.h"
 
 namespace lodestack {
@@ -62,12 +63,7 @@ bool ValueCollection::write(IStream& stream) const {
 bool ValueCollection::read(IStream& stream) {
   unsigned int count = 0;
   if (!stream.readUint32(count)) return false;
-  // Each item takes at least 4 bytes, which bounds what is worth reserving.
-  unsigned int plausible = count;
-  if (count > 64) {
-    const unsigned int left = stream.bytesLeftHint();
-    plausible = left / 4 < count ? left / 4 : count;
-  }
+  const unsigned int plausible = plausibleItems(stream, count);
   if (plausible <= (1u << 20)) reserve(size() + plausible);
   for (unsigned int i = 0; i < count; ++i) {
     Variant* item = Variant::create();

@@ -1,3 +1,7 @@
+#include <algorithm>
+#include <fstream>
+#include <string>
+#include <utility>
 #include <vector>
 
 #include <gtest/gtest.h>
@@ -255,6 +259,61 @@ TEST(GenericObject, WritingCloningAndComparingAreBoundedLikeReading) {
   EXPECT_NE(*loop, *other);
   EXPECT_EQ(*loop, *loop) << "the same object compares equal at once";
   ASSERT_TRUE(loop->removeProperty(1) && other->removeProperty(1));  // no leak
+}
+
+// Bytes delivered a few at a time by a stream that can neither seek nor
+// tell its size (a pipe, a socket). Records the largest virtual memory size
+// of the process seen while it was read.
+class UnsizedStream : public IStream {
+ public:
+  explicit UnsizedStream(Bytes bytes) : bytes_(std::move(bytes)) {}
+  bool good() const override { return true; }
+  bool seekFromStart(unsigned int) override { return false; }
+  bool seekFromEnd(unsigned int) override { return false; }
+  unsigned int offset() const override { return static_cast<unsigned int>(at_); }
+  bool eof() const override { return at_ == bytes_.size(); }
+  bool getSize(unsigned int&) override { return false; }
+  bool canRead() const override { return true; }
+  bool canSeek() const override { return false; }
+  bool canWrite() const override { return false; }
+  unsigned int read(unsigned char* dst, unsigned int n) override {
+    peakKiB = std::max(peakKiB, virtualKiB());
+    const std::size_t m = std::min<std::size_t>(n, bytes_.size() - at_);
+    std::copy(bytes_.begin() + at_, bytes_.begin() + at_ + m, dst);
+    at_ += m;
+    return static_cast<unsigned int>(m);
+  }
+  unsigned int write(const unsigned char*, unsigned int) override { return 0; }
+  bool flush() override { return false; }
+
+  static long virtualKiB() {
+    std::ifstream status("/proc/self/status");
+    std::string line;
+    while (std::getline(status, line)) {
+      if (line.rfind("VmSize:", 0) == 0) return std::stol(line.substr(7));
+    }
+    return 0;
+  }
+  long peakKiB = 0;
+
+ private:
+  Bytes bytes_;
+  std::size_t at_ = 0;
+};
+
+// 100 nested collections, each claiming 2^20 items, in some 800 bytes: an
+// unsized stream cannot vouch for the counts, so little is reserved for them.
+TEST(GenericObject, CountsFromAnUnsizedStreamReserveLittle) {
+  Bytes bytes = {1, 0, 1, 0, 0, 0};
+  for (int level = 0; level < Variant::kMaxNestingDepth; ++level) {
+    const Bytes collection = {15, 0, 1, 0, 0, 0, 0x10, 0};
+    bytes.insert(bytes.end(), collection.begin(), collection.end());
+  }
+  UnsizedStream in(bytes);
+  const long before = UnsizedStream::virtualKiB();
+  EXPECT_FALSE(GenericObject::create(in)) << "the claimed items never come";
+  EXPECT_TRUE(in.eof());
+  EXPECT_LT(in.peakKiB - before, 64 * 1024) << "KiB of address space taken while reading";
 }
 
 }  // namespace
