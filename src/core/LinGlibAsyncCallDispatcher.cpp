@@ -104,6 +104,8 @@ void LinGlibAsyncCallDispatcher::removeDetachedPollers() {
 bool LinGlibAsyncCallDispatcher::sleep() { return sleep(-1) == 1; }
 
 int LinGlibAsyncCallDispatcher::sleep(int timeoutMs) {
+  // A callback may drop the last handle to this dispatcher; finish first.
+  gom::SharedPointer<LinGlibAsyncCallDispatcher> keepAlive(this);
   sleepTimeout_ = timeoutMs;
   const gboolean dispatched = g_main_context_iteration(nullptr, TRUE);
   sleepTimeout_ = -1;

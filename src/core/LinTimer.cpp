@@ -67,7 +67,8 @@ class LinTimer : public ITimer, public IPollSink {
     return timerfd_settime(fd_, 0, &disarmed, nullptr) == 0 ? Ok : Failed;
   }
 
-  // A stop() inside timeout does not shorten the burst already counted.
+  // A stop() inside timeout does not shorten the burst already counted;
+  // dropping the timer does.
   void handlePollEvent(const pollfd& p) override {
     if (p.fd != fd_ || !observer_) throw WrongObjectType;
     // The observer may drop the last handle to this timer from timeout.
@@ -77,6 +78,9 @@ class LinTimer : public ITimer, public IPollSink {
     if (expirations > kMaxCallsPerWakeUp) expirations = kMaxCallsPerWakeUp;
     for (std::uint64_t i = 0; i < expirations; ++i) {
       if (observer_) observer_->timeout(this);
+      // Only keepAlive is left: the owner let the timer go, and its
+      // observer may well have gone with it.
+      if (referenceCount() == 1) break;
     }
   }
 

@@ -16,6 +16,7 @@
 #include "lodestack/core/IAsyncCallDispatcher.h"
 #include "lodestack/core/IPollSink.h"
 #include "lodestack/core/IThread.h"
+#include "lodestack/core/ITimer.h"
 #include "lodestack/gom/SharedPointer.h"
 
 namespace lodestack {
@@ -104,6 +105,17 @@ struct SocketPair {
     fds[1] = -1;
   }
   pollfd watch() const { return {fds[0], POLLIN, 0}; }
+};
+
+// Holds its timer and drops it in its first timeout, as the owner of a
+// finished request would.
+struct TimerOwner : ITimerObserver {
+  SharedPointer<ITimer> timer{ITimer::create(this)};
+  int calls = 0;
+  void timeout(ITimer*) override {
+    ++calls;
+    timer.clear();
+  }
 };
 
 }  // namespace testing

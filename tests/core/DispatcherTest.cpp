@@ -140,6 +140,30 @@ TEST_P(DispatcherTest, BurstFromAnotherThreadIsNotLost) {
   EXPECT_EQ(log_.calls.size(), size_t(kCalls)) << "no call ran twice";
 }
 
+void dropLastHandle(void* handle) {
+  delete static_cast<SharedPointer<IAsyncCallDispatcher>*>(handle);
+  gLog->record(0);
+}
+
+// The last handle to the dispatcher goes inside a callback of its sleep(int):
+// from a queued call, then with a timer dropped in its timeout. The
+// dispatcher outlives that sleep (ASan and valgrind watch); runUntil calls
+// no further sleep once the callback has run.
+TEST_P(DispatcherTest, LastHandleDroppedInsideACallback) {
+  LoopTypeScope scope(GetParam());
+  IAsyncCallDispatcher* raw = dispatcher_.get();
+  ASSERT_TRUE(raw->queueAsyncCall(&dropLastHandle,
+                                  new SharedPointer<IAsyncCallDispatcher>(dispatcher_)));
+  dispatcher_.clear();
+  EXPECT_TRUE(runUntil(*raw, [&] { return log_.calls.size() == 1; }));
+
+  TimerOwner owner;
+  ASSERT_TRUE(owner.timer);
+  raw = AsyncCallDispatcher::openDispatcher(GetParam()).get();  // held by the timer alone
+  ASSERT_EQ(owner.timer->start(10LL, 0ULL, 0u), Ok);
+  EXPECT_TRUE(runUntil(*raw, [&] { return owner.calls == 1; }));
+}
+
 INSTANTIATE_TEST_SUITE_P(Backends, DispatcherTest,
                          ::testing::Values(AsyncCallDispatcher::MainLoopPoll,
                                            AsyncCallDispatcher::MainLoopGlib),

@@ -71,5 +71,16 @@ TEST_F(TimerTest, ABurstAfterAStallIsCappedAt256) {
   EXPECT_EQ(observer_.calls, 256);
 }
 
+// The owner drops the timer in the first call of a burst: the burst ends
+// there, since its observer may be gone with it.
+TEST_F(TimerTest, DroppingTheTimerEndsItsBurst) {
+  TimerOwner owner;
+  ASSERT_TRUE(owner.timer);
+  ASSERT_EQ(owner.timer->start(1LL, 1ULL, 0u), Ok);
+  std::this_thread::sleep_for(std::chrono::milliseconds(50));
+  ASSERT_EQ(dispatcher_->sleep(5000), 1);
+  EXPECT_EQ(owner.calls, 1);
+}
+
 }  // namespace
 }  // namespace lodestack::core

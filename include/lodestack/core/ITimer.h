@@ -23,7 +23,9 @@ class LODESTACK_EXPORT ITimerObserver {
  public:
   virtual ~ITimerObserver();
   // One call per expiry. After a long stall one wake-up delivers at most 256
-  // calls back to back; further missed expiries are lost.
+  // calls back to back; further missed expiries are lost. A stop() inside
+  // timeout does not shorten such a burst; dropping the last handle to the
+  // timer does, so no call follows once the owner has let the timer go.
   virtual void timeout(ITimer* timer) = 0;
 };
 
