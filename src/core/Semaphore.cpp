@@ -11,6 +11,20 @@ namespace core {
 
 namespace {
 
+// Unlocks on every way out of a wait, the unwinding of a thread cancelled
+// inside it included: the condition wait takes the mutex back before such a
+// thread unwinds.
+class Unlocker {
+ public:
+  explicit Unlocker(pthread_mutex_t& mutex) : mutex_(mutex) {}
+  ~Unlocker() { pthread_mutex_unlock(&mutex_); }
+  Unlocker(const Unlocker&) = delete;
+  Unlocker& operator=(const Unlocker&) = delete;
+
+ private:
+  pthread_mutex_t& mutex_;
+};
+
 class LinSemaphore : public ISemaphore {
  public:
   LinSemaphore() : count_(0), maximum_(0) {}
@@ -53,13 +67,13 @@ class LinSemaphore : public ISemaphore {
 
   bool zero() override {
     if (maximum_ == 0 || pthread_mutex_lock(&mutex_) != 0) return false;
+    const Unlocker unlocker(mutex_);
     // A wait to "now" on the monotonic clock returns at once (see doWait).
     timespec now{};
     clock_gettime(CLOCK_MONOTONIC, &now);
     const int rc = pthread_cond_timedwait(&condition_, &mutex_, &now);
     const bool ok = rc == 0 || rc == ETIMEDOUT;
     if (ok) count_ = 0;
-    pthread_mutex_unlock(&mutex_);
     return ok;
   }
 
@@ -71,20 +85,17 @@ class LinSemaphore : public ISemaphore {
     if (maximum_ == 0) return 0;
     const int lockRc = pthread_mutex_lock(&mutex_);
     if (lockRc != 0) return lockRc == ETIMEDOUT ? 2 : 0;
+    const Unlocker unlocker(mutex_);
     timespec deadline{};
     if (timed) deadline = deadlineWithoutCarry(CLOCK_MONOTONIC, ms);
     for (;;) {
       if (count_ > 0) {
         --count_;
-        pthread_mutex_unlock(&mutex_);
         return 1;
       }
       const int rc = timed ? pthread_cond_timedwait(&condition_, &mutex_, &deadline)
                            : pthread_cond_wait(&condition_, &mutex_);
-      if (rc != 0) {
-        pthread_mutex_unlock(&mutex_);
-        return rc == ETIMEDOUT ? 2 : 0;
-      }
+      if (rc != 0) return rc == ETIMEDOUT ? 2 : 0;
     }
   }
 

@@ -1,6 +1,7 @@
 #include <errno.h>
 #include <pthread.h>
 
+#include <atomic>
 #include <new>
 
 #include "core/Deadline.h"
@@ -13,9 +14,29 @@ namespace core {
 
 namespace {
 
+// What the new thread touches: its start gate and observer. Shared by the
+// thread and its LinThread, either of which may go first (a LinThread
+// dropped before resume only cancels its thread), so the last one out
+// deletes it.
+class StartBlock {
+ public:
+  explicit StartBlock(IThreadObserver* observer) : observer(observer), users_(1) {}
+  void share() { users_.fetch_add(1, std::memory_order_relaxed); }
+  void release() {
+    if (users_.fetch_sub(1, std::memory_order_acq_rel) == 1) delete this;
+  }
+
+  gom::SharedPointer<ISemaphore> gate;
+  IThreadObserver* const observer;
+
+ private:
+  ~StartBlock() = default;
+  std::atomic<int> users_;
+};
+
 class LinThread : public IThread {
  public:
-  LinThread() : observer_(nullptr), handle_(), live_(false) {}
+  LinThread() : start_(nullptr), handle_(), live_(false) {}
 
   // A thread never joined is cancelled, not joined, and then detached so
   // that its resources go back when it ends.
@@ -24,14 +45,20 @@ class LinThread : public IThread {
       pthread_cancel(handle_);
       pthread_detach(handle_);
     }
+    if (start_) start_->release();
   }
 
   bool create(IThreadObserver* observer, bool suspended) {
-    gate_ = gom::SharedPointer<ISemaphore>(ISemaphore::create(0, 1));
-    if (!gate_) return false;
-    if (pthread_create(&handle_, nullptr, &LinThread::entry, this) != 0) return false;
+    start_ = new (std::nothrow) StartBlock(observer);
+    if (!start_) return false;
+    start_->gate = gom::SharedPointer<ISemaphore>(ISemaphore::create(0, 1));
+    if (!start_->gate) return false;
+    start_->share();
+    if (pthread_create(&handle_, nullptr, &LinThread::entry, start_) != 0) {
+      start_->release();
+      return false;
+    }
     live_ = true;
-    observer_ = observer;  // published to the thread by the gate's signal
     if (!suspended) resume();
     return true;
   }
@@ -56,7 +83,7 @@ class LinThread : public IThread {
     return rc == ETIMEDOUT ? 2 : 0;
   }
 
-  bool resume() override { return gate_->signal(1, nullptr); }
+  bool resume() override { return start_->gate->signal(1, nullptr); }
 
   // Joins a finished thread as a side effect.
   bool isRunning() const override {
@@ -67,21 +94,22 @@ class LinThread : public IThread {
   }
 
  private:
-  static void* entry(void* self) {
-    static_cast<LinThread*>(self)->threadFunction();
+  // Runs on the new thread; its share of the start block goes when it ends
+  // or unwinds from a cancellation.
+  static void* entry(void* block) {
+    struct Share {
+      StartBlock* block;
+      ~Share() { block->release(); }
+    } share{static_cast<StartBlock*>(block)};
+    share.block->gate->wait();
+    if (share.block->observer) share.block->observer->threadMain();
     return nullptr;
   }
 
-  void threadFunction() {
-    gate_->wait();
-    if (observer_) observer_->threadMain();
-  }
-
-  IThreadObserver* observer_;
+  StartBlock* start_;  // null only when create failed early
   pthread_t handle_;
   // True from start until joined; a joined handle is never used again.
   mutable bool live_;
-  gom::SharedPointer<ISemaphore> gate_;
 };
 
 }  // namespace

@@ -2,10 +2,13 @@
 //
 // Made by IThread::create and reference counted: callers keep it in a
 // gom::SharedPointer<IThread>. A new thread first waits on its start gate and
-// runs threadMain only after resume(). The object must outlive the thread's
-// body: call wait() (or see isRunning() report false) before dropping the
-// last handle; destroying a live thread only cancels it. The observer is not
-// owned. The library itself starts no thread; this is offered to its users.
+// runs threadMain only after resume(). Destroying the object cancels a
+// thread that was not joined, without waiting for it: one dropped before
+// resume() ends at its gate without running threadMain, but one already
+// running goes on until its next cancellation point, so call wait() (or see
+// isRunning() report false) before dropping the last handle. The observer is
+// not owned. The library itself starts no thread; this is offered to its
+// users.
 #ifndef LODESTACK_CORE_ITHREAD_H
 #define LODESTACK_CORE_ITHREAD_H
 
