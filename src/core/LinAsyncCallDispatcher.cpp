@@ -4,6 +4,7 @@
 #include <sys/socket.h>
 #include <unistd.h>
 
+#include "core/Descriptor.h"
 #include "core/GuardedCall.h"
 
 namespace lodestack {
@@ -31,7 +32,13 @@ LinAsyncCallDispatcher::~LinAsyncCallDispatcher() {
 
 bool LinAsyncCallDispatcher::baseInit() {
   int fds[2];
-  if (socketpair(AF_UNIX, SOCK_SEQPACKET, 0, fds) != 0) return false;
+  if (socketpair(AF_UNIX, SOCK_SEQPACKET | SOCK_CLOEXEC, 0, fds) != 0) return false;
+  for (int& fd : fds) fd = offZero(fd);
+  if (fds[0] < 0 || fds[1] < 0) {
+    for (int fd : fds)
+      if (fd >= 0) close(fd);
+    return false;
+  }
   readFd_ = fds[0];
   writeFd_ = fds[1];
   setsockopt(writeFd_, SOL_SOCKET, SO_SNDBUF, &kSendBufferBytes, sizeof kSendBufferBytes);

@@ -4,6 +4,7 @@
 #include <cstdint>
 #include <new>
 
+#include "core/Descriptor.h"
 #include "lodestack/core/AsyncCallDispatcher.h"
 #include "lodestack/core/ITimer.h"
 #include "lodestack/core/LinAsyncCallDispatcher.h"
@@ -36,7 +37,7 @@ class LinTimer : public ITimer, public IPollSink {
     linDispatcher_ = dynamic_cast<LinAsyncCallDispatcher*>(dispatcher_.get());
     if (!linDispatcher_) return false;
     // Blocking on purpose: it is read only once the dispatcher saw it ready.
-    fd_ = timerfd_create(CLOCK_REALTIME, 0);
+    fd_ = offZero(timerfd_create(CLOCK_REALTIME, TFD_CLOEXEC));
     if (fd_ == -1) {
       fd_ = 0;
       return false;

@@ -1,8 +1,13 @@
 #include <gtest/gtest.h>
 
+#include <fcntl.h>
+
 #include <cstdlib>
+#include <filesystem>
 #include <memory>
+#include <set>
 #include <stdexcept>
+#include <string>
 #include <vector>
 
 #include "core/CoreTestSupport.h"
@@ -197,6 +202,56 @@ TEST(AsyncCallDispatcher, PerThreadRegistry) {
   });
   ASSERT_TRUE(other.thread().wait());
   EXPECT_TRUE(there != nullptr && there != chosen.get()) << "each thread has its own";
+}
+
+// The process's open descriptors.
+std::set<int> openDescriptors() {
+  std::set<int> fds;
+  for (const auto& entry : std::filesystem::directory_iterator("/proc/self/fd"))
+    fds.insert(std::stoi(entry.path().filename().string()));
+  for (auto it = fds.begin(); it != fds.end();)  // the listing's own is closed now
+    it = fcntl(*it, F_GETFD) == -1 ? fds.erase(it) : std::next(it);
+  return fds;
+}
+
+// The descriptors of dispatchers and timers are close-on-exec and never 0,
+// which means "none" to them, even in a process whose standard input is
+// closed: there the first descriptor made would be 0.
+TEST(AsyncCallDispatcher, DescriptorsAreCloseOnExecAndNeverZero) {
+  // GLib's default context makes its own descriptor once, before counting.
+  ASSERT_TRUE(AsyncCallDispatcher::openDispatcher(AsyncCallDispatcher::MainLoopGlib));
+  const int savedStdin = dup(0);
+  for (bool stdinClosed : {false, true}) {
+    if (stdinClosed) close(0);
+    const std::set<int> before = openDescriptors();
+    FunctionThread owner([&] {  // a thread that has no dispatcher yet
+      for (Type type : {AsyncCallDispatcher::MainLoopPoll, AsyncCallDispatcher::MainLoopGlib}) {
+        LoopTypeScope scope(type);
+        SharedPointer<IAsyncCallDispatcher> dispatcher = AsyncCallDispatcher::openDispatcher(type);
+        ASSERT_TRUE(dispatcher) << "type " << type << ", stdin closed " << stdinClosed;
+        TimerOwner timerOwner;
+        ASSERT_TRUE(timerOwner.timer);
+        std::vector<int> made;
+        for (int fd : openDescriptors())
+          if (!before.count(fd)) made.push_back(fd);
+        EXPECT_EQ(made.size(), 3u) << "a socket pair and a timer";
+        for (int fd : made) {
+          EXPECT_NE(fd, 0);
+          EXPECT_TRUE(fcntl(fd, F_GETFD) & FD_CLOEXEC) << "descriptor " << fd;
+        }
+        ASSERT_EQ(timerOwner.timer->start(10LL, 0ULL, 0u), Ok);
+        EXPECT_TRUE(runUntil(*dispatcher, [&] { return timerOwner.calls == 1; }));
+      }
+    });
+    ASSERT_TRUE(owner.thread().wait());
+    if (stdinClosed) {
+      EXPECT_EQ(fcntl(0, F_GETFD), -1) << "standard input stays closed";
+    }
+  }
+  if (savedStdin >= 0) {
+    dup2(savedStdin, 0);
+    close(savedStdin);
+  }
 }
 
 TEST(PollDispatcher, SinksHangUpAndAttachInsideCallbacks) {
