@@ -56,9 +56,11 @@ void AsyncCallDispatcherCommon::addDelegate(const Delegate& delegate) {
 
 // Matches on receiver OR function. Every function entry has a null receiver
 // and every receiver entry a null function, so each form sweeps its whole
-// kind, blank entry included; kept deliberately.
+// kind, blank entry included; kept deliberately. Without the lock nothing
+// is removed.
 void AsyncCallDispatcherCommon::removeDelegate(const Delegate& pattern) {
   ScopedLock lock(pending_);
+  if (!lock.locked()) return;
   DelegateMap& map = pending_.value();
   for (auto it = map.begin(); it != map.end();) {
     if (it->second.receiver == pattern.receiver || it->second.function == pattern.function)
@@ -71,8 +73,10 @@ void AsyncCallDispatcherCommon::removeDelegate(const Delegate& pattern) {
 void AsyncCallDispatcherCommon::invokeDelegate(unsigned int id) {
   Delegate delegate;
   {
-    // Found and erased in one step: the call runs at most once.
+    // Found and erased in one step: the call runs at most once. Without the
+    // lock it is not found.
     ScopedLock lock(pending_);
+    if (!lock.locked()) return;
     DelegateMap& map = pending_.value();
     duringTake();
     const auto it = map.find(id);

@@ -74,7 +74,7 @@ void LinAsyncCallDispatcher::flushUnsentLocked() {
 void LinAsyncCallDispatcher::resendUnsent() {
   if (!stalled_.load(std::memory_order_relaxed)) return;
   ScopedLock lock(pendingLock());
-  flushUnsentLocked();
+  if (lock.locked()) flushUnsentLocked();  // else tried again next time
 }
 
 void LinAsyncCallDispatcher::handlePollEvent(const pollfd&) { invokeApc(); }

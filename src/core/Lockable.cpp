@@ -8,8 +8,7 @@ LockableBase::LockableBase()
 LockableBase::~LockableBase() = default;
 
 bool LockableBase::lock() {
-  if (!mutex_) return false;
-  mutex_->lock();
+  if (!mutex_ || !mutex_->lock()) return false;
   ++depth_;
   return true;
 }

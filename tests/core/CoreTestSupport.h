@@ -118,6 +118,19 @@ struct TimerOwner : ITimerObserver {
   }
 };
 
+// While it lives, the next `count` pthread_mutex_lock calls made on this
+// thread (by the test or the library) fail with EINVAL, as a lock the system
+// refuses would. Defined in FailingLocks.cpp.
+class FailingLocks {
+ public:
+  explicit FailingLocks(int count);
+  ~FailingLocks();
+  FailingLocks(const FailingLocks&) = delete;
+  FailingLocks& operator=(const FailingLocks&) = delete;
+  // How many of the failures are still to come.
+  int left() const;
+};
+
 }  // namespace testing
 }  // namespace core
 }  // namespace lodestack

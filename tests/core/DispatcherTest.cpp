@@ -169,6 +169,32 @@ TEST_P(DispatcherTest, LastHandleDroppedInsideACallback) {
   EXPECT_TRUE(runUntil(*raw, [&] { return owner.calls == 1; }));
 }
 
+// A lock the system refuses: queueing fails, removal drops nothing, and a
+// call is not looked up (its record goes, the call stays pending).
+TEST_P(DispatcherTest, PendingLockRefused) {
+  ASSERT_TRUE(dispatcher_->queueAsyncCall(&logCall, asParam(1)));
+  bool queued = true;
+  {
+    FailingLocks failing(2);
+    queued = dispatcher_->queueAsyncCall(&logCall, asParam(2));
+    dispatcher_->removeAllAsyncCall(&logCall);
+    ASSERT_EQ(failing.left(), 0) << "both went for the lock";
+  }
+  EXPECT_FALSE(queued);
+  EXPECT_EQ(dispatcher_->sleep(1000), 1);
+  EXPECT_EQ(log_.calls, std::vector<long>{1}) << "the pending call survived the removal";
+  EXPECT_EQ(dispatcher_->sleep(50), idle()) << "nothing was queued";
+
+  ASSERT_TRUE(dispatcher_->queueAsyncCall(&logCall, asParam(3)));
+  {
+    FailingLocks failing(1);
+    for (int turn = 0; turn < 50 && failing.left() > 0; ++turn) dispatcher_->sleep(100);
+    ASSERT_EQ(failing.left(), 0) << "the record was read";
+  }
+  EXPECT_EQ(log_.calls.size(), 1u) << "a call looked up without the lock ran";
+  dispatcher_->removeAllAsyncCall(&logCall);
+}
+
 INSTANTIATE_TEST_SUITE_P(Backends, DispatcherTest,
                          ::testing::Values(AsyncCallDispatcher::MainLoopPoll,
                                            AsyncCallDispatcher::MainLoopGlib),

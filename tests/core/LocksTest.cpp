@@ -122,6 +122,17 @@ TEST(Lockable, DepthAndUnmatchedUnlock) {
   counter.unlock();  // unmatched: harmless
   ASSERT_EQ(counter.tryLock(0), 1);
   counter.unlock();
+
+  // A lock the system refuses is not held, and nothing is unlocked for it.
+  {
+    FailingLocks failing(1);
+    EXPECT_FALSE(counter.lock());
+  }
+  counter.unlock();
+  ASSERT_TRUE(counter.lock());
+  FunctionThread other([&] { EXPECT_EQ(counter.tryLock(0), 0) << "still held once"; });
+  ASSERT_TRUE(other.thread().wait());
+  counter.unlock();
 }
 
 }  // namespace

@@ -29,6 +29,7 @@ class LODESTACK_EXPORT IAsyncCallDispatcher : public gom::ReferenceCountable {
   // Drop pending calls. Deliberately broad: the function form drops every
   // pending function call whatever its function, the receiver form every
   // pending receiver call whatever its receiver (a null receiver: nothing).
+  // When the lock cannot be taken nothing is dropped.
   virtual void removeAllAsyncCall(void (*function)(void*)) = 0;
   virtual void removeAllAsyncCall(IAsyncCallReceiver* receiver) = 0;
 

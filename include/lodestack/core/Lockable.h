@@ -23,7 +23,8 @@ class LODESTACK_EXPORT LockableBase {
   LockableBase(const LockableBase&) = delete;
   LockableBase& operator=(const LockableBase&) = delete;
 
-  // Blocks until held; false when there is no mutex.
+  // Blocks until held; false (nothing held) when there is no mutex or it
+  // cannot be taken.
   bool lock();
   // As IMutex::tryLock; 0 when there is no mutex.
   int tryLock(unsigned int ms);
