@@ -6,7 +6,14 @@
 // for the GLib kind, from the thread's GLib main loop. Any thread may queue
 // and remove calls; sleep belongs to the owning thread only. Reference
 // counted with a non-atomic count: copy and drop SharedPointers on the owning
-// thread only, and hand other threads a plain pointer for queueing.
+// thread only, and hand other threads a plain pointer for queueing. A
+// callback may drop the last handle to the dispatcher that runs it; the
+// dispatcher goes once the current sleep or dispatch is over.
+//
+// After fork the child shares the parent's wake-up socket pair, so either
+// side may read the other's records: the child must not use a dispatcher
+// inherited from the parent, and on the forking thread openDispatcher would
+// return exactly that one.
 #ifndef LODESTACK_CORE_IASYNCCALLDISPATCHER_H
 #define LODESTACK_CORE_IASYNCCALLDISPATCHER_H
 
@@ -36,7 +43,11 @@ class LODESTACK_EXPORT IAsyncCallDispatcher : public gom::ReferenceCountable {
   // sleep(-1) == 1: blocks until one event was handled.
   virtual bool sleep() = 0;
   // Waits up to `timeoutMs` (-1: no limit) and handles what is ready. The
-  // result depends on the kind; see the back-ends.
+  // poll kind returns 2 on time-out, 1 when at least one callback ran and 0
+  // otherwise (poll failed, or what was ready was not dispatched). The GLib
+  // kind runs one iteration of the default main context and returns 1 when
+  // it dispatched anything there (another source too), 0 otherwise,
+  // time-out included.
   virtual int sleep(int timeoutMs) = 0;
 };
 

@@ -3,6 +3,11 @@
 // Attached to a LinAsyncCallDispatcher for a descriptor; handlePollEvent runs
 // on the dispatcher's owning thread whenever that descriptor is readable. The
 // dispatcher does not own its sinks: detach before destroying one.
+//
+// A descriptor that reports input together with an error or hang-up (a peer
+// that closed) is never dispatched, yet it stays ready and keeps the loop
+// awake: every sleep returns at once. A sink must detach as soon as it sees
+// the end of its input by other means (a read that returns 0).
 #ifndef LODESTACK_CORE_IPOLLSINK_H
 #define LODESTACK_CORE_IPOLLSINK_H
 

@@ -36,6 +36,8 @@ class LODESTACK_EXPORT LinAsyncCallDispatcher : public AsyncCallDispatcherCommon
   // Registers `sink` for the descriptor of `p` (the back-end watches it for
   // input whatever p.events says). False when `sink` is null, the descriptor
   // is 0 or already has a sink, or the back-end refused; nothing changes then.
+  // Input that comes with a hang-up is not dispatched and keeps the loop
+  // awake (see IPollSink): detach at the end of the input.
   virtual bool attachPollSink(const pollfd& p, IPollSink* sink);
   // Stops watching the descriptor of `p` and forgets its sink.
   virtual void detachPollSink(const pollfd& p);

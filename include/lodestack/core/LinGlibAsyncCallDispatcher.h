@@ -6,9 +6,12 @@
 // run inside an application's ordinary GLib main loop, or from sleep, which
 // runs one iteration of that context. One per thread, made by create() (or
 // AsyncCallDispatcher::openDispatcher with MainLoopGlib or the thread's
-// default) and shared by everybody on that thread. Since all such
-// dispatchers share the default context, the thread that iterates that
-// context is their owning thread: run one GLib dispatcher at a time.
+// default) and shared by everybody on that thread. Every GLib dispatcher, on
+// whatever thread it was made, attaches to the process's default main
+// context: calls queued on one thread's GLib dispatcher, its sinks and its
+// timers run on whichever thread iterates that context (an application's
+// GMainLoop, or any thread's sleep). That thread is their real owner: keep
+// GLib dispatchers on the one thread that iterates the default context.
 #ifndef LODESTACK_CORE_LINGLIBASYNCCALLDISPATCHER_H
 #define LODESTACK_CORE_LINGLIBASYNCCALLDISPATCHER_H
 
