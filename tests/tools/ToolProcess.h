@@ -1,5 +1,5 @@
 // Runs the built lodestack-scan as a child process for the tool's tests and
-// collects what it prints; temporary files that go when the test ends.
+// collects what it prints.
 #ifndef LODESTACK_TESTS_TOOLS_TOOLPROCESS_H
 #define LODESTACK_TESTS_TOOLS_TOOLPROCESS_H
 
@@ -13,10 +13,7 @@
 
 #include <algorithm>
 #include <chrono>
-#include <cstdio>
 #include <cstdlib>
-#include <fstream>
-#include <iterator>
 #include <sstream>
 #include <string>
 #include <utility>
@@ -24,11 +21,16 @@
 
 #include <nlohmann/json.hpp>
 
+#include "support/TemporaryDirectory.h"
+
 namespace tooltest {
 
 using Json = nlohmann::json;
 using Clock = std::chrono::steady_clock;
 using Args = std::vector<std::string>;
+using lodestack::testing::readText;
+using lodestack::testing::TemporaryDirectory;
+using lodestack::testing::writeText;
 
 struct Outcome {
   int exitStatus = -1;  // -1 when the child did not exit normally
@@ -70,16 +72,17 @@ class Tool {
     }
     close(out[1]);
     close(err[1]);
-    out_ = out[0];
-    err_ = err[0];
+    fds_[0] = out[0];
+    fds_[1] = err[0];
   }
   ~Tool() {
     if (pid_ > 0 && !reaped_) {
       kill(pid_, SIGKILL);
       waitpid(pid_, nullptr, 0);
     }
-    if (out_ >= 0) close(out_);
-    if (err_ >= 0) close(err_);
+    for (int fd : fds_) {
+      if (fd >= 0) close(fd);
+    }
   }
 
   // Collects output until stdout holds `lines` lines or the child closed it.
@@ -111,27 +114,25 @@ class Tool {
       ADD_FAILURE() << "lodestack-scan ran too long";
       return false;
     }
-    pollfd fds[2] = {{out_, POLLIN, 0}, {err_, POLLIN, 0}};
-    if (out_ < 0 && err_ < 0) return false;
-    if (poll(fds, 2, 1000) <= 0) return true;
+    if (fds_[0] < 0 && fds_[1] < 0) return false;
+    pollfd ready[2] = {{fds_[0], POLLIN, 0}, {fds_[1], POLLIN, 0}};
+    if (poll(ready, 2, 1000) <= 0) return true;
     for (int i = 0; i < 2; ++i) {
-      if (!fds[i].revents) continue;
-      int& fd = i == 0 ? out_ : err_;
+      if (!ready[i].revents) continue;
       char buffer[4096];
-      const ssize_t n = read(fd, buffer, sizeof buffer);
+      const ssize_t n = read(fds_[i], buffer, sizeof buffer);
       if (n > 0) {
         (i == 0 ? outcome_.out : outcome_.err).append(buffer, static_cast<std::size_t>(n));
       } else {
-        close(fd);
-        fd = -1;
+        close(fds_[i]);
+        fds_[i] = -1;
       }
     }
     return true;
   }
 
   pid_t pid_ = -1;
-  int out_ = -1;
-  int err_ = -1;
+  int fds_[2] = {-1, -1};  // stdout, stderr
   bool reaped_ = false;
   Outcome outcome_;
   const Clock::time_point deadline_ = Clock::now() + std::chrono::seconds(120);
@@ -149,29 +150,16 @@ inline std::vector<std::string> linesOf(const std::string& text) {
   return lines;
 }
 
-inline std::string readFile(const std::string& path) {
-  std::ifstream in(path, std::ios::binary);
-  return std::string(std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>());
-}
-inline void writeFile(const std::string& path, const std::string& bytes) {
-  std::ofstream(path, std::ios::binary | std::ios::trunc) << bytes;
-}
-
-// Removes the files it named when the test ends.
-class ToolTest : public ::testing::Test {
- protected:
-  void TearDown() override {
-    for (const std::string& f : files_) std::remove(f.c_str());
+// The --json lines of `out`, those of `kind` only when one is named; a line
+// that is not JSON throws.
+inline std::vector<Json> jsonLines(const std::string& out, const std::string& kind = "") {
+  std::vector<Json> found;
+  for (const std::string& line : linesOf(out)) {
+    Json object = Json::parse(line);
+    if (kind.empty() || object.value("kind", "") == kind) found.push_back(std::move(object));
   }
-  std::string tempFile(const std::string& name) {
-    files_.push_back(::testing::TempDir() + "scan_" + std::to_string(getpid()) + "_" + name);
-    std::remove(files_.back().c_str());
-    return files_.back();
-  }
-
- private:
-  std::vector<std::string> files_;
-};
+  return found;
+}
 
 }  // namespace tooltest
 
