@@ -7,6 +7,7 @@
 
 #include <ctime>
 #include <functional>
+#include <map>
 #include <memory>
 #include <string>
 #include <vector>
@@ -30,6 +31,8 @@ using MeasurementType = radioadaptation::IRadioAdaptation::MeasurementType;
 // UTRA-TDD, 14 E-UTRA, 17 CDMA, 20 WLAN) per entry, each with a valid cell
 // identity and no time stamp.
 inline SharedPointer<GenericObject> containerOf(std::initializer_list<unsigned short> typeIds) {
+  static const std::map<unsigned short, unsigned short> kCollection = {
+      {2, 300}, {3, 301}, {4, 302}, {14, 310}, {17, 312}, {20, 314}};
   SharedPointer<schema::MeasurementContainer> c = schema::MeasurementContainer::create();
   for (unsigned short typeId : typeIds) {
     SharedPointer<GenericObject> m = GenericObject::create(typeId);
@@ -43,13 +46,7 @@ inline SharedPointer<GenericObject> containerOf(std::initializer_list<unsigned s
       default: break;
     }
     if (dn) (void)m->setObjectProperty(200, dn);
-    const unsigned short collection = typeId == 2    ? 300
-                                      : typeId == 3  ? 301
-                                      : typeId == 4  ? 302
-                                      : typeId == 14 ? 310
-                                      : typeId == 17 ? 312
-                                                     : 314;
-    (void)c->addMeasurement(m, typeId, collection);
+    (void)c->addMeasurement(m, typeId, kCollection.at(typeId));
   }
   return c->wrappedObject();
 }
@@ -95,7 +92,6 @@ class TestPlatform : public RadioAdaptationCommon {
   Answer answer = Answer::Later;
   Status answerStatus = Ok;  // the status the platform reports
   Status startFailure = Failed;
-  int laterMs = 5;
   // The result of a finished measurement of a kind.
   std::function<SharedPointer<GenericObject>(MeasurementType)> makeResult =
       [](MeasurementType type) {
@@ -130,7 +126,7 @@ class TestPlatform : public RadioAdaptationCommon {
         handleRequestComplete(type, makeResult(type), answerStatus, true);
         return Ok;
       case Answer::Later:
-        later(type).start(laterMs);
+        later(type).timer->start(5, 0, 0);
         return Ok;
       case Answer::Never:
         return Ok;
@@ -139,36 +135,27 @@ class TestPlatform : public RadioAdaptationCommon {
   }
   Status doCancelRequest(MeasurementType type) override {
     calls.push_back("cancel " + std::to_string(type));
-    if (type != Gnss) later(type).stop();
+    if (type != Gnss) later(type).timer->stop();
     return Ok;
   }
 
  private:
-  // The platform's own timer for a later answer of one kind.
+  // The platform's own timer answering one kind later.
   struct LaterAnswer : core::ITimerObserver {
-    TestPlatform* owner = nullptr;
-    MeasurementType type = Cellular;
-    SharedPointer<core::ITimer> timer;
-    void start(int ms) {
-      if (!timer) timer = SharedPointer<core::ITimer>(core::ITimer::create(this));
-      timer->start(ms, 0, 0);
-    }
-    void stop() {
-      if (timer) timer->stop();
-    }
+    LaterAnswer(TestPlatform& owner, MeasurementType type) : owner(owner), type(type) {}
     void timeout(core::ITimer*) override {
-      owner->handleRequestComplete(type, owner->makeResult(type), owner->answerStatus, false);
+      owner.handleRequestComplete(type, owner.makeResult(type), owner.answerStatus, false);
     }
+    TestPlatform& owner;
+    MeasurementType type;
+    SharedPointer<core::ITimer> timer{core::ITimer::create(this)};
   };
 
-  TestPlatform() {
-    laterCellular_.owner = laterWlan_.owner = this;
-    laterWlan_.type = Wlan;
-  }
+  TestPlatform() = default;
   LaterAnswer& later(MeasurementType type) { return type == Wlan ? laterWlan_ : laterCellular_; }
 
-  LaterAnswer laterCellular_;
-  LaterAnswer laterWlan_;
+  LaterAnswer laterCellular_{*this, Cellular};
+  LaterAnswer laterWlan_{*this, Wlan};
 };
 
 // One call of an observer.
@@ -180,17 +167,19 @@ struct Delivery {
   double atSeconds;  // since the observer was made
 };
 
-// A service observer that records what reaches it, and whether anything
-// came while `inside` (set by tests around requestMeasurements) held.
-struct Recorder : IMeasurementsObserver {
+// What reached an observer, and whether anything came while `inside` (set
+// by tests around requestMeasurements) held.
+struct DeliveryLog {
   std::vector<Delivery> got;
-  bool inside = false;  // set around requestMeasurements
+  bool inside = false;
   bool calledInside = false;
+  std::function<void()> onDelivery;  // runs inside each call
   std::chrono::steady_clock::time_point start = std::chrono::steady_clock::now();
-  void measurementsReady(unsigned int id, int types, SharedPointer<GenericObject> m,
-                         Status status) override {
+
+  void record(unsigned int id, int types, const SharedPointer<GenericObject>& m, Status status) {
     calledInside = calledInside || inside;
     got.push_back({id, types, m, status, core::testing::secondsSince(start)});
+    if (onDelivery) onDelivery();
   }
   std::size_t count(int types) const {
     std::size_t n = 0;
@@ -204,6 +193,14 @@ struct Recorder : IMeasurementsObserver {
   }
 };
 
+// A service observer that records what reaches it.
+struct Recorder : IMeasurementsObserver, DeliveryLog {
+  void measurementsReady(unsigned int id, int types, SharedPointer<GenericObject> m,
+                         Status status) override {
+    record(id, types, m, status);
+  }
+};
+
 // Chooses the thread's loop type for a test and gives its dispatcher.
 class DispatcherFixture : public ::testing::TestWithParam<core::AsyncCallDispatcher::MainLoopType> {
  protected:
@@ -212,7 +209,6 @@ class DispatcherFixture : public ::testing::TestWithParam<core::AsyncCallDispatc
         dispatcher_(core::AsyncCallDispatcher::openDispatcher(
             core::AsyncCallDispatcher::MainLoopDefault)) {}
 
-  core::IAsyncCallDispatcher& loop() { return *dispatcher_; }
   // Turns of the loop until `done` or `seconds` pass; returns done().
   bool runUntil(const std::function<bool()>& done, double seconds = 20.0) {
     return core::testing::runUntil(*dispatcher_, done, seconds);
