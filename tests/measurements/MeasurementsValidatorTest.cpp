@@ -1,8 +1,4 @@
 // The validator on containers built from the schema's records.
-#include <gtest/gtest.h>
-
-#include <lodestack/lodestack.h>
-
 #include "radioadaptation/TestPlatform.h"
 #include "schema/SampleRecords.h"
 
@@ -13,12 +9,20 @@ namespace {
 using namespace schema;
 using V = MeasurementsValidator;
 
-// A container holding the measurement `m` in its technology's collection.
+// A container holding the measurement `m` in collection `collection`.
 template <class M>
 SharedPointer<GenericObject> containerWith(const SharedPointer<M>& m, unsigned short collection) {
   SharedPointer<MeasurementContainer> c = MeasurementContainer::create();
   EXPECT_EQ(c->addMeasurement(m->wrappedObject(), M::kTypeId, collection), Ok);
   return c->wrappedObject();
+}
+
+// A sample measurement M changed by `change`, alone in collection `collection`.
+template <class M, class Change>
+SharedPointer<GenericObject> sampleWith(unsigned short collection, Change change) {
+  SharedPointer<M> m = sample::measurement<M>();
+  change(*m);
+  return containerWith(m, collection);
 }
 
 // Runs the validator on every cellular collection, as the provider does.
@@ -34,101 +38,72 @@ TEST(MeasurementsValidator, CompleteMeasurementsPassUnchanged) {
 }
 
 TEST(MeasurementsValidator, MeasurementsWithoutWhatPositioningNeedsAreRemoved) {
-  // Each case breaks one thing of an otherwise valid GERAN or UTRA-FDD
-  // measurement and expects it gone from its collection.
+  // A valid CDMA measurement beside an element that holds a number.
+  SharedPointer<GenericObject> noObject = containerOf({17});
+  (void)measurementsOf(noObject, 312)[0]->setUint32Property(205, 1);
+  SharedPointer<gom::ValueCollection> cdma;
+  (void)noObject->getCollectionProperty(312, cdma);
+  gom::Variant* number = gom::Variant::create();
+  (void)number->setUint32Value(5);
+  (void)cdma->add(number);
+
+  // Each case breaks one thing of an otherwise valid measurement.
   struct Case {
     const char* what;
-    std::function<SharedPointer<GenericObject>()> make;
     unsigned short collection;
+    SharedPointer<GenericObject> container;
+    std::size_t left;
   };
   const std::vector<Case> cases = {
-      {"GERAN without time stamp",
-       [] {
-         auto m = sample::measurement<GeranCellMeasurement>();
-         m->unset(MeasurementBase::kTimeStamp);
-         return containerWith(m, 300);
-       },
-       300},
-      {"UTRA-FDD identity without ucid",
-       [] {
-         auto m = sample::measurement<UtraFddCellMeasurement>();
-         m->dn()->unset(4);
-         return containerWith(m, 301);
-       },
-       301},
-      {"GERAN identity without cid",
-       [] {
-         auto m = sample::measurement<GeranCellMeasurement>();
-         m->dn()->unset(8);
-         return containerWith(m, 300);
-       },
-       300},
-      {"E-UTRA with a UTRA identity",
-       [] {
-         auto m = sample::measurement<EUtraCellMeasurement>();
-         (void)m->object().setObjectProperty(200, sample::full<UtraCellDn>());
-         return containerWith(m, 310);
-       },
-       310},
-      {"UTRA-TDD measurement in the UTRA-FDD collection",
-       [] {
-         SharedPointer<MeasurementContainer> c = MeasurementContainer::create();
-         (void)c->addMeasurement(sample::measurement<UtraTddCellMeasurement>()->wrappedObject(), 4,
-                                 301);
-         return c->wrappedObject();
-       },
-       301},
-      {"element holding no object",
-       [] {
-         SharedPointer<GenericObject> c = containerOf({17});
-         SharedPointer<gom::ValueCollection> collection;
-         (void)c->getCollectionProperty(312, collection);
-         gom::Variant* number = gom::Variant::create();
-         (void)number->setUint32Value(5);
-         (void)collection->add(number);
-         (void)measurementsOf(c, 312)[0]->setUint32Property(205, 1);
-         return c;
-       },
-       312},
+      {"GERAN without time stamp", 300,
+       sampleWith<GeranCellMeasurement>(300, [](auto& m) { m.unset(MeasurementBase::kTimeStamp); }), 0},
+      {"UTRA-FDD identity without ucid", 301,
+       sampleWith<UtraFddCellMeasurement>(301, [](auto& m) { m.dn()->unset(4); }), 0},
+      {"GERAN identity without cid", 300,
+       sampleWith<GeranCellMeasurement>(300, [](auto& m) { m.dn()->unset(8); }), 0},
+      {"E-UTRA with a UTRA identity", 310,
+       sampleWith<EUtraCellMeasurement>(310, [](auto& m) {
+         (void)m.object().setObjectProperty(200, sample::full<UtraCellDn>());
+       }), 0},
+      {"UTRA-TDD measurement in the UTRA-FDD collection", 301,
+       sampleWith<UtraTddCellMeasurement>(301, [](auto&) {}), 0},
+      {"element holding no object", 312, noObject, 1},
   };
   for (const Case& test : cases) {
-    SharedPointer<GenericObject> c = test.make();
-    const std::size_t validBefore = test.collection == 312 ? 1 : 0;
+    SCOPED_TRACE(test.what);
+    SharedPointer<GenericObject> c = test.container;
     validateAll(c);
     SharedPointer<gom::ValueCollection> left;
     ASSERT_EQ(c->getCollectionProperty(test.collection, left), Ok)
-        << test.what << ": a collection emptied by the walk stays";
-    EXPECT_EQ(left->size(), validBefore) << test.what;
+        << "a collection emptied by the walk stays";
+    EXPECT_EQ(left->size(), test.left);
   }
 }
 
 TEST(MeasurementsValidator, IncompleteServingCellsLoseTheirPartOnly) {
-  // GERAN: the frequency info lacks its arfcn; the serving cell stays
-  // without it and keeps its other values.
+  // GERAN: the frequency info lacks its arfcn.
   auto geran = sample::measurement<GeranCellMeasurement>();
   geran->servingCellMeasurement()->frequencyInfo()->unset(2);
-  SharedPointer<GenericObject> c = containerWith(geran, 300);
-  validateAll(c);
-  ASSERT_EQ(measurementsOf(c, 300).size(), 1u);
-  SharedPointer<GeranServingCellMeasurement> serving = geran->servingCellMeasurement();
-  ASSERT_TRUE(serving);
-  EXPECT_FALSE(serving->valueExists(4));
-  EXPECT_TRUE(serving->valueExists(1 | 2));
-
   // E-UTRA: the serving network measurement lacks its frequency info.
   auto eutra = sample::measurement<EUtraCellMeasurement>();
   eutra->servingCellMeasurement()->nwMeasurement()->unset(1);
-  c = containerWith(eutra, 310);
-  validateAll(c);
-  ASSERT_TRUE(eutra->servingCellMeasurement());
-  EXPECT_FALSE(eutra->servingCellMeasurement()->valueExists(1));
-
-  // A serving cell of another technology's record is dropped whole.
+  // UTRA-FDD: a serving cell of another technology's record, dropped whole.
   auto fdd = sample::measurement<UtraFddCellMeasurement>();
   (void)fdd->object().setObjectProperty(202, sample::full<UtraTddServingCellMeasurement>());
-  c = containerWith(fdd, 301);
+  SharedPointer<MeasurementContainer> all = MeasurementContainer::create();
+  (void)all->addGeranMeasurement(geran->wrappedObject());
+  (void)all->addEUtraMeasurement(eutra->wrappedObject());
+  (void)all->addUtraFddMeasurement(fdd->wrappedObject());
+  SharedPointer<GenericObject> c = all->wrappedObject();
   validateAll(c);
-  ASSERT_EQ(measurementsOf(c, 301).size(), 1u);
+
+  for (unsigned short collection : {300, 301, 310})
+    EXPECT_EQ(measurementsOf(c, collection).size(), 1u) << "the measurement stays: " << collection;
+  ASSERT_TRUE(geran->servingCellMeasurement());
+  EXPECT_FALSE(geran->servingCellMeasurement()->valueExists(4));
+  EXPECT_TRUE(geran->servingCellMeasurement()->valueExists(1 | 2)) << "its other values stay";
+  ASSERT_TRUE(eutra->servingCellMeasurement());
+  EXPECT_FALSE(eutra->servingCellMeasurement()->valueExists(1));
   EXPECT_FALSE(fdd->object().propertyExists(202));
 }
 
@@ -144,10 +119,9 @@ TEST(MeasurementsValidator, NeighbourEntries) {
   badFrequency->frequencyInfo()->unset(1);
   for (const auto& nw : {lacOnly, neither, noFrequency, badFrequency})
     ASSERT_EQ(geran->addNwMeasurement(nw), Ok);
-  SharedPointer<gom::ValueCollection> neighbours = geran->nwMeasurementCollection();
   gom::Variant* wrongRecord = gom::Variant::create();
   (void)wrongRecord->setObjectValue(sample::full<UtraFddNwMeasurement>());
-  (void)neighbours->add(wrongRecord);
+  (void)geran->nwMeasurementCollection()->add(wrongRecord);
 
   SharedPointer<GenericObject> c = containerWith(geran, 300);
   validateAll(c);
@@ -156,8 +130,7 @@ TEST(MeasurementsValidator, NeighbourEntries) {
 
   // CDMA neighbours are not checked.
   auto cdma = sample::measurement<CdmaCellMeasurement>();
-  SharedPointer<CdmaNwMeasurement> bare = CdmaNwMeasurement::create();
-  ASSERT_EQ(cdma->addNwMeasurement(bare), Ok);
+  ASSERT_EQ(cdma->addNwMeasurement(CdmaNwMeasurement::create()), Ok);
   c = containerWith(cdma, 312);
   validateAll(c);
   EXPECT_EQ(cdma->nwMeasurementCollection()->size(), 4u);
