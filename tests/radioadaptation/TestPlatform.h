@@ -260,7 +260,6 @@ class AdaptationFixture : public DispatcherFixture {
   static const int kCellular = IMeasurementsObserver::Cellular;
   static const int kWlan = IMeasurementsObserver::Wlan;
   static const int kGnss = IMeasurementsObserver::Gnss;
-  static const int kAll = kCellular | kWlan | kGnss;
 
   Recorder observer;
   std::unique_ptr<radioadaptation::IRadioAdaptation> radio;
