@@ -1,6 +1,9 @@
 // The geolocation web-service request built from a round's results.
 #include <gtest/gtest.h>
 
+#include <string>
+#include <vector>
+
 #include <lodestack/lodestack.h>
 
 #include "GeolocationRequest.h"
@@ -86,37 +89,12 @@ TEST(GeolocationRequest, CellTowersFromEachTechnology) {
             geolocationRequest(cells, nullptr));
 }
 
-TEST(GeolocationRequest, AccessPointsWithMacAddresses) {
-  SharedPointer<MeasurementContainer> aps = MeasurementContainer::create();
-  const unsigned char bssid[8] = {0x00, 0x1A, 0x2B, 0x3C, 0x4D, 0x5E, 0x6F, 0x70};
-  for (unsigned int length : {6u, 8u}) {
-    SharedPointer<WlanDn> dn = WlanDn::create();
-    ASSERT_EQ(Ok, dn->setBssid(bssid, length));
-    SharedPointer<WlanMeasurement> m = WlanMeasurement::create(dn, 1700000000u);
-    SharedPointer<WlanApMeasurement> ap = WlanApMeasurement::create();
-    (void)ap->setRxLevel(-67);
-    m->setWlanApMeasurement(ap);
-    ASSERT_EQ(Ok, aps->addWlanMeasurement(m->wrappedObject()));
-  }
-  SharedPointer<WlanDn> quiet = WlanDn::create();
-  const unsigned char quietBssid[6] = {0x00, 0x1A, 0x2B, 0x3C, 0x4D, 0x5F};
-  ASSERT_EQ(Ok, quiet->setBssid(quietBssid, 6));
-  ASSERT_EQ(Ok, aps->addWlanMeasurement(WlanMeasurement::create(quiet, 1700000000u)->wrappedObject()));
-
-  // An 8-byte identifier is no MAC address; a level not measured is left out.
-  EXPECT_EQ(Json::parse(R"({"cellTowers": [], "wifiAccessPoints": [
-      {"macAddress": "00:1a:2b:3c:4d:5e", "signalStrength": -67},
-      {"macAddress": "00:1a:2b:3c:4d:5f"}]})"),
-            geolocationRequest(nullptr, aps));
-  EXPECT_EQ(Json::parse(R"({"cellTowers": [], "wifiAccessPoints": []})"),
-            geolocationRequest(nullptr, nullptr));
-}
-
-// An access point heard at -60 dBm, named `ssid` when it is not empty.
-gom::SharedPointer<gom::GenericObject> accessPoint(const unsigned char (&bssid)[6],
-                                                   const std::string& ssid) {
+// An access point named `ssid` when it is not empty, heard at `level` dBm
+// when it is not 0.
+gom::SharedPointer<gom::GenericObject> accessPoint(const std::vector<unsigned char>& bssid,
+                                                   const std::string& ssid, signed char level) {
   SharedPointer<WlanDn> dn = WlanDn::create();
-  EXPECT_EQ(Ok, dn->setBssid(bssid, 6));
+  EXPECT_EQ(Ok, dn->setBssid(bssid.data(), static_cast<unsigned int>(bssid.size())));
   if (!ssid.empty()) {
     const SharedPointer<gom::CharacterData> name =
         gom::CharacterData::create(ssid.data(), static_cast<unsigned int>(ssid.size()));
@@ -124,53 +102,56 @@ gom::SharedPointer<gom::GenericObject> accessPoint(const unsigned char (&bssid)[
                                                      name));
   }
   SharedPointer<WlanMeasurement> m = WlanMeasurement::create(dn, 1700000000u);
-  SharedPointer<WlanApMeasurement> ap = WlanApMeasurement::create();
-  (void)ap->setRxLevel(-60);
-  m->setWlanApMeasurement(ap);
+  if (level) {
+    SharedPointer<WlanApMeasurement> ap = WlanApMeasurement::create();
+    (void)ap->setRxLevel(level);
+    m->setWlanApMeasurement(ap);
+  }
   return m->wrappedObject();
 }
 
-TEST(GeolocationRequest, OptedOutAndLocallyAdministeredAccessPointsAreLeftOut) {
+TEST(GeolocationRequest, AccessPointsLessTheOptedOutAndThoseWithoutAMacAddress) {
   struct Case {
-    unsigned char bssid[6];
+    std::vector<unsigned char> bssid;
     const char* ssid;
+    signed char level;
     bool sent;
   };
   const Case cases[] = {
-      {{0x00, 0x1A, 0x2B, 0x00, 0x00, 0x01}, "home", true},
-      {{0x00, 0x1A, 0x2B, 0x00, 0x00, 0x02}, "cafe_nomap", false},
-      {{0x00, 0x1A, 0x2B, 0x00, 0x00, 0x03}, "_nomap", false},
-      {{0x00, 0x1A, 0x2B, 0x00, 0x00, 0x04}, "_nomap_guest", true},  // not at the end
-      {{0x00, 0x1A, 0x2B, 0x00, 0x00, 0x05}, "", true},              // name unknown
-      {{0x02, 0x1A, 0x2B, 0x00, 0x00, 0x06}, "", false},             // locally administered
-      {{0xDE, 0x1A, 0x2B, 0x00, 0x00, 0x07}, "hotspot", false},      // 0xDE has the bit too
-      {{0xFC, 0x1A, 0x2B, 0x00, 0x00, 0x08}, "shop", true},          // 0xFC has not
+      {{0x00, 0x1A, 0x2B, 0x00, 0x00, 0x01}, "home", -60, true},
+      {{0x00, 0x1A, 0x2B, 0x00, 0x00, 0x02}, "cafe_nomap", -60, false},
+      {{0x00, 0x1A, 0x2B, 0x00, 0x00, 0x03}, "_nomap", -60, false},
+      {{0x00, 0x1A, 0x2B, 0x00, 0x00, 0x04}, "_nomap_guest", -60, true},  // not at the end
+      {{0x00, 0x1A, 0x2B, 0x00, 0x00, 0x05}, "", -67, true},              // name unknown
+      {{0x00, 0x1A, 0x2B, 0x00, 0x00, 0x06}, "", 0, true},                // level unknown
+      {{0x02, 0x1A, 0x2B, 0x00, 0x00, 0x07}, "", -60, false},             // locally administered
+      {{0xDE, 0x1A, 0x2B, 0x00, 0x00, 0x08}, "hotspot", -60, false},      // 0xDE has the bit too
+      {{0xFC, 0x1A, 0x2B, 0x00, 0x00, 0x09}, "shop", -60, true},          // 0xFC has not
+      {{0x00, 0x1A, 0x2B, 0x3C, 0x4D, 0x5E, 0x6F, 0x70}, "", -60, false}, // no MAC address
   };
   SharedPointer<MeasurementContainer> aps = MeasurementContainer::create();
   Json expected = Json::array();
   for (const Case& c : cases) {
-    ASSERT_EQ(Ok, aps->addWlanMeasurement(accessPoint(c.bssid, c.ssid)));
-    if (c.sent) {
-      expected.push_back({{"macAddress", bssidText(c.bssid, 6)}, {"signalStrength", -60}});
-    }
+    ASSERT_EQ(Ok, aps->addWlanMeasurement(accessPoint(c.bssid, c.ssid, c.level)));
+    if (!c.sent) continue;
+    expected.push_back({{"macAddress", bssidText(c.bssid.data(), 6)}});
+    if (c.level) expected.back()["signalStrength"] = c.level;
   }
   const Json request = geolocationRequest(nullptr, aps);
   EXPECT_EQ(expected, request["wifiAccessPoints"]);
-  EXPECT_EQ("", whyNotLocatable(request));
+  EXPECT_EQ(Json::array(), request["cellTowers"]);
 }
 
 TEST(GeolocationRequest, WithoutACellTwoAccessPointsAreNeeded) {
+  const auto request = [](std::size_t towers, std::size_t aps) {
+    return Json{{"cellTowers", std::vector<Json>(towers, {{"radioType", "gsm"}, {"cellId", 1}})},
+                {"wifiAccessPoints", std::vector<Json>(aps, {{"macAddress", "00:1a:2b:3c:4d:5e"}})}};
+  };
   const char* why = "no request sent: fewer than two access points and no cell";
-  const Json ap = {{"macAddress", "00:1a:2b:3c:4d:5e"}};
-  const Json one = Json::array({ap});
-  const Json two = Json::array({ap, ap});
-  const Json cell = {{"radioType", "gsm"}, {"cellId", 1}};
-  const Json tower = Json::array({cell});
-  const Json none = Json::array();
-  EXPECT_EQ(why, whyNotLocatable({{"cellTowers", none}, {"wifiAccessPoints", none}}));
-  EXPECT_EQ(why, whyNotLocatable({{"cellTowers", none}, {"wifiAccessPoints", one}}));
-  EXPECT_EQ("", whyNotLocatable({{"cellTowers", none}, {"wifiAccessPoints", two}}));
-  EXPECT_EQ("", whyNotLocatable({{"cellTowers", tower}, {"wifiAccessPoints", none}}));
+  EXPECT_EQ(why, whyNotLocatable(geolocationRequest(nullptr, nullptr)));
+  EXPECT_EQ(why, whyNotLocatable(request(0, 1)));
+  EXPECT_EQ("", whyNotLocatable(request(0, 2)));
+  EXPECT_EQ("", whyNotLocatable(request(1, 0)));
 }
 
 }  // namespace

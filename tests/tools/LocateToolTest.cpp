@@ -12,7 +12,6 @@
 #include <vector>
 
 #include "ToolProcess.h"
-#include "platform/MockBus.h"
 
 namespace {
 
@@ -26,22 +25,7 @@ const std::string kScenario = kTestDir + "/locate.json";
 class Service {
  public:
   Service() {
-    int out[2];
-    if (pipe2(out, O_CLOEXEC) != 0) return;
-    process_.start({"/usr/bin/python3", kTestDir + "/geolocation_server.py", dir_.file("log"),
-                    "--answer", "60.172,24.945,400"},
-                   out[1]);
-    close(out[1]);
-    // Its first line is the port it listens on.
-    std::string line;
-    pollfd p = {out[0], POLLIN, 0};
-    char c = 0;
-    while (line.find('\n') == std::string::npos && poll(&p, 1, 10000) == 1 &&
-           read(out[0], &c, 1) == 1) {
-      line += c;
-    }
-    close(out[0]);
-    port_ = std::atoi(line.c_str());
+    if (server_.waitForLines(1)) port_ = std::atoi(server_.out().c_str());  // the port it took
   }
 
   bool running() const { return port_ > 0; }
@@ -53,7 +37,9 @@ class Service {
 
  private:
   TemporaryDirectory dir_;
-  lodestack::testing::ChildProcess process_;
+  Tool server_{{kTestDir + "/geolocation_server.py", dir_.file("log"), "--answer",
+                "60.172,24.945,400"},
+               "", Env(), "/usr/bin/python3"};
   int port_ = 0;
 };
 

@@ -41,13 +41,13 @@ struct Outcome {
 // Variables set in the child's environment, name and value.
 using Env = std::vector<std::pair<std::string, std::string>>;
 
-// The tool running as a child, its output collected through pipes. Of the
-// host platform's variables only LODESTACK_SCENARIO reaches it; no proxy or
-// geolocation key reaches it but through `env`.
+// The tool (or another `program`) running as a child, its output collected
+// through pipes. Of the host platform's variables only LODESTACK_SCENARIO
+// reaches it; no proxy or geolocation key reaches it but through `env`.
 class Tool {
  public:
   explicit Tool(const Args& args, const std::string& scenario = std::string(),
-                const Env& env = Env()) {
+                const Env& env = Env(), const std::string& program = LODESTACK_SCAN_TOOL) {
     int out[2], err[2];
     if (pipe2(out, O_CLOEXEC) != 0 || pipe2(err, O_CLOEXEC) != 0) return;
     pid_ = fork();
@@ -64,7 +64,7 @@ class Tool {
         unsetenv(name);
       }
       for (const auto& [name, value] : env) setenv(name.c_str(), value.c_str(), 1);
-      std::vector<char*> argv{const_cast<char*>(LODESTACK_SCAN_TOOL)};
+      std::vector<char*> argv{const_cast<char*>(program.c_str())};
       for (const std::string& a : args) argv.push_back(const_cast<char*>(a.c_str()));
       argv.push_back(nullptr);
       execv(argv[0], argv.data());
@@ -93,6 +93,7 @@ class Tool {
     return true;
   }
   void signal(int number) { kill(pid_, number); }
+  const std::string& out() const { return outcome_.out; }
 
   // Everything the child writes, and how it ended.
   Outcome finish() {
