@@ -1,6 +1,6 @@
-#include <cmath>
 #include <functional>
 #include <limits>
+#include <memory>
 
 #include <gtest/gtest.h>
 
@@ -12,31 +12,26 @@
 namespace lodestack::gom {
 namespace {
 
-TEST(Variant, NeverChangesKind) {
-  Variant v(1);
-  EXPECT_EQ(v.setUint8Value(200), Ok);
-  EXPECT_EQ(v.setInt8Value(-1), Refused);
-  unsigned char u8 = 0;
-  EXPECT_EQ(v.getUint8Value(u8), Ok);
-  EXPECT_EQ(u8, 200) << "a refused setter leaves the value";
-
-  signed char i8 = 99;
-  EXPECT_EQ(v.getInt8Value(i8), Refused);
-  EXPECT_EQ(i8, 99) << "no conversion between kinds";
-
-  Variant empty;
+// A variant keeps the kind it first took, and compares by key, kind and
+// bit image.
+TEST(Variant, KindsAndEquality) {
+  Variant u8(1), i8(1);
+  EXPECT_EQ(u8.setUint8Value(200), Ok);
+  EXPECT_EQ(u8.setInt8Value(-1), Refused);
+  unsigned char u = 0;
+  EXPECT_EQ(u8.getUint8Value(u), Ok);
+  EXPECT_EQ(u, 200) << "a refused setter leaves the value";
+  signed char i = 99;
+  EXPECT_EQ(u8.getInt8Value(i), Refused);
+  EXPECT_EQ(i, 99) << "no conversion between kinds";
   bool b;
-  EXPECT_EQ(empty.getBooleanValue(b), Refused);
-  EXPECT_EQ(empty.setStringValue(CharacterData::create("x", 1)), Ok);
-  EXPECT_EQ(empty.setUint32Value(1), Refused);
-}
+  EXPECT_EQ(Variant().getBooleanValue(b), Refused) << "an empty variant has no kind";
+  ASSERT_EQ(i8.setInt8Value(-56), Ok);
+  EXPECT_NE(i8, u8) << "the same bits in another kind";
 
-TEST(Variant, EqualityIsByKeyKindAndBitImage) {
-  Variant a(1), b(2);
-  ASSERT_EQ(a.setUint32Value(5), Ok);
-  ASSERT_EQ(b.setUint32Value(5), Ok);
-  EXPECT_NE(a, b) << "another key makes another variant";
-  EXPECT_EQ(a, Variant(1, b));
+  Variant other(2, u8);
+  EXPECT_NE(other, u8) << "another key makes another variant";
+  EXPECT_EQ(Variant(1, other), u8);
 
   const double nan = std::numeric_limits<double>::quiet_NaN();
   Variant n1(1), n2(1), z1(1), z2(1);
@@ -46,11 +41,6 @@ TEST(Variant, EqualityIsByKeyKindAndBitImage) {
   ASSERT_EQ(z2.setFloatValue(-0.0f), Ok);
   EXPECT_EQ(n1, n2) << "the identical NaN is equal to itself";
   EXPECT_NE(z1, z2) << "+0 and -0 differ bitwise";
-
-  Variant i8(1), u8(1);
-  ASSERT_EQ(i8.setInt8Value(1), Ok);
-  ASSERT_EQ(u8.setUint8Value(1), Ok);
-  EXPECT_NE(i8, u8) << "kinds differ";
 }
 
 TEST(Variant, CopiesShareAndClonesCopy) {
@@ -58,30 +48,18 @@ TEST(Variant, CopiesShareAndClonesCopy) {
   ASSERT_EQ(inner->setUint8Property(1, 1), Ok);
   Variant v(3);
   ASSERT_EQ(v.setGenericObjectValue(inner), Ok);
-  EXPECT_EQ(inner->referenceCount(), 2);
-
   Variant shared = v;
   EXPECT_EQ(inner->referenceCount(), 3) << "a copy shares the object";
 
+  std::unique_ptr<Variant> deep(v.clone());
   SharedPointer<GenericObject> got;
-  Variant* deep = v.clone();
-  ASSERT_NE(deep, nullptr);
-  ASSERT_EQ(deep->getGenericObjectValue(got), Ok);
+  ASSERT_TRUE(deep && deep->getGenericObjectValue(got) == Ok);
   EXPECT_NE(got, inner) << "a clone holds its own object";
   EXPECT_EQ(*deep, v) << "which compares equal by content";
-  got.clear();
-  delete deep;
 
-  SharedPointer<ValueCollection> list = ValueCollection::create();
-  Variant holder(4);
-  ASSERT_EQ(holder.setCollectionValue(list), Ok);
-  EXPECT_EQ(list->referenceCount(), 2);
-  holder = v;
-  EXPECT_EQ(list->referenceCount(), 1) << "assignment releases the held collection";
   shared = Variant();
   v = Variant();
-  holder = Variant();
-  EXPECT_EQ(inner->referenceCount(), 1);
+  EXPECT_EQ(inner->referenceCount(), 1) << "assignment releases the object";
 }
 
 // A variant that holds the last reference to an object is assigned one of
