@@ -73,24 +73,6 @@ TEST(MeasurementTree, CellsShowEveryPresentValueByItsSchemaName) {
   EXPECT_EQ(Keys({"timeStamp"}), keysOf(tree["gnss"][0]));
 }
 
-TEST(MeasurementTree, AbsentValuesAreLeftOut) {
-  SharedPointer<GeranCellDn> dn = GeranCellDn::create();
-  (void)dn->setMcc(244);
-  (void)dn->setCid(21001);
-  SharedPointer<GeranCellMeasurement> m = GeranCellMeasurement::create();
-  m->setDn(dn);
-  SharedPointer<GeranServingCellMeasurement> serving = GeranServingCellMeasurement::create();
-  (void)serving->setTimingAdvance(0);
-  m->setServingCellMeasurement(serving);
-  SharedPointer<MeasurementContainer> c = MeasurementContainer::create();
-  ASSERT_EQ(Ok, c->addGeranMeasurement(m->wrappedObject()));
-
-  EXPECT_EQ(Json::parse(R"({"geran": [{"mcc": 244, "cid": 21001,
-                                       "servingCellMeasurement": {"timingAdvance": 0}}]})"),
-            measurementTree(c->wrappedObject()));
-  EXPECT_EQ(Json::object(), measurementTree(MeasurementContainer::create()->wrappedObject()));
-}
-
 TEST(MeasurementTree, WlanAndGnssValuesInReadableForm) {
   SharedPointer<MeasurementContainer> c = MeasurementContainer::create();
   ASSERT_EQ(Ok, c->addWlanMeasurement(wlanMeasurement({0x00, 0x1A, 0x2B, 0x3C, 0x4D, 0xEF}, -61)));
@@ -120,15 +102,24 @@ TEST(MeasurementTree, WlanAndGnssValuesInReadableForm) {
             tree["gnss"][0]);
 }
 
-TEST(MeasurementTree, ResultTreeAndItsText) {
+TEST(MeasurementTree, ResultTreeAndItsTextLeaveAbsentValuesOut) {
   Result timeout{IMeasurementsObserver::Wlan, 7, Timeout, nullptr};
   EXPECT_EQ(Json::parse(R"({"kind": "wlan", "requestId": 7, "status": "Timeout",
                             "measurements": null})"),
             resultTree(timeout));
   EXPECT_EQ("wlan request 7: Timeout\n", resultText(resultTree(timeout)));
+  EXPECT_EQ(Json::object(), measurementTree(MeasurementContainer::create()->wrappedObject()));
 
-  SharedPointer<GeranCellMeasurement> cell =
-      GeranCellMeasurement::create(GeranCellDn::create(244, 5, 4100, 21001), 1700000000u);
+  // A GSM cell of which the country, the cell id, a timing advance of 0 and
+  // a neighbour are known.
+  SharedPointer<GeranCellDn> dn = GeranCellDn::create();
+  (void)dn->setMcc(244);
+  (void)dn->setCid(21001);
+  SharedPointer<GeranCellMeasurement> cell = GeranCellMeasurement::create();
+  cell->setDn(dn);
+  SharedPointer<GeranServingCellMeasurement> serving = GeranServingCellMeasurement::create();
+  (void)serving->setTimingAdvance(0);
+  cell->setServingCellMeasurement(serving);
   SharedPointer<GeranNwMeasurement> neighbour =
       GeranNwMeasurement::create(GeranFrequencyInfo::create(12, 62));
   (void)neighbour->setRxLevel(20);
@@ -137,17 +128,20 @@ TEST(MeasurementTree, ResultTreeAndItsText) {
   ASSERT_EQ(Ok, c->addGeranMeasurement(cell->wrappedObject()));
   ASSERT_EQ(Ok, c->addWlanMeasurement(wlanMeasurement({1, 2, 3, 4, 5, 6}, -61)));
   const Result result{IMeasurementsObserver::Cellular, 1, UnreliableMeasurement, c->wrappedObject()};
+  const Json tree = resultTree(result);
+  EXPECT_EQ(Json::parse(R"([{"mcc": 244, "cid": 21001, "servingCellMeasurement": {"timingAdvance": 0},
+                             "nwMeasurements": [{"frequencyInfo": {"bsic": 12, "arfcn": 62},
+                                                 "rxLevel": 20}]}])"),
+            tree["measurements"]["geran"]);
   EXPECT_EQ(
       "cellular request 1: UnreliableMeasurement\n"
       "  geran[0]:\n"
       "    mcc: 244\n"
-      "    mnc: 5\n"
-      "    lac: 4100\n"
       "    cid: 21001\n"
-      "    timeStamp: 2023-11-14T22:13:20Z\n"
+      "    servingCellMeasurement: timingAdvance 0\n"
       "    nwMeasurements[0]: frequencyInfo (bsic 12, arfcn 62), rxLevel 20\n"
       "  wlan[0]: bssid 01:02:03:04:05:06, timeStamp 2023-11-14T22:13:20Z, rxLevel -61\n",
-      resultText(resultTree(result)));
+      resultText(tree));
 
   // An object that is no measurement container cannot be walked.
   const Result foreign{IMeasurementsObserver::Cellular, 1, Ok, GenericObject::create(20)};

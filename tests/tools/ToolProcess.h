@@ -41,19 +41,21 @@ struct Outcome {
 // Variables set in the child's environment, name and value.
 using Env = std::vector<std::pair<std::string, std::string>>;
 
-// The tool (or another `program`) running as a child, its output collected
-// through pipes. Of the host platform's variables only LODESTACK_SCENARIO
-// reaches it; no proxy or geolocation key reaches it but through `env`.
+// The tool (or another `program`) running as a child, its standard output
+// collected through a pipe and its standard error through a file. Of the
+// host platform's variables only LODESTACK_SCENARIO reaches it; no proxy or
+// geolocation key reaches it but through `env`.
 class Tool {
  public:
   explicit Tool(const Args& args, const std::string& scenario = std::string(),
                 const Env& env = Env(), const std::string& program = LODESTACK_SCAN_TOOL) {
-    int out[2], err[2];
-    if (pipe2(out, O_CLOEXEC) != 0 || pipe2(err, O_CLOEXEC) != 0) return;
+    int out[2];
+    const int err = open(dir_.file("stderr").c_str(), O_WRONLY | O_CREAT | O_CLOEXEC, 0600);
+    if (err < 0 || pipe2(out, O_CLOEXEC) != 0) return;
     pid_ = fork();
     if (pid_ == 0) {
       dup2(out[1], 1);
-      dup2(err[1], 2);
+      dup2(err, 2);
       unsetenv("LODESTACK_GNSS");
       if (scenario.empty())
         unsetenv("LODESTACK_SCENARIO");
@@ -70,19 +72,16 @@ class Tool {
       execv(argv[0], argv.data());
       _exit(127);
     }
+    close(err);
     close(out[1]);
-    close(err[1]);
-    fds_[0] = out[0];
-    fds_[1] = err[0];
+    out_ = out[0];
   }
   ~Tool() {
     if (pid_ > 0 && !reaped_) {
       kill(pid_, SIGKILL);
       waitpid(pid_, nullptr, 0);
     }
-    for (int fd : fds_) {
-      if (fd >= 0) close(fd);
-    }
+    if (out_ >= 0) close(out_);
   }
 
   // Collects output until stdout holds `lines` lines or the child closed it.
@@ -104,36 +103,35 @@ class Tool {
       outcome_.exitStatus = WEXITSTATUS(status);
     }
     reaped_ = true;
+    outcome_.err = readText(dir_.file("stderr"));
     return outcome_;
   }
 
  private:
-  // One read from whichever pipe is ready; false once both are closed or the
-  // child has run far too long.
+  // One read of stdout; false once the child closed it or has run far too
+  // long.
   bool pump() {
     if (Clock::now() > deadline_) {
       ADD_FAILURE() << "lodestack-scan ran too long";
       return false;
     }
-    if (fds_[0] < 0 && fds_[1] < 0) return false;
-    pollfd ready[2] = {{fds_[0], POLLIN, 0}, {fds_[1], POLLIN, 0}};
-    if (poll(ready, 2, 1000) <= 0) return true;
-    for (int i = 0; i < 2; ++i) {
-      if (!ready[i].revents) continue;
-      char buffer[4096];
-      const ssize_t n = read(fds_[i], buffer, sizeof buffer);
-      if (n > 0) {
-        (i == 0 ? outcome_.out : outcome_.err).append(buffer, static_cast<std::size_t>(n));
-      } else {
-        close(fds_[i]);
-        fds_[i] = -1;
-      }
+    if (out_ < 0) return false;
+    pollfd ready = {out_, POLLIN, 0};
+    if (poll(&ready, 1, 1000) <= 0) return true;
+    char buffer[4096];
+    const ssize_t n = read(out_, buffer, sizeof buffer);
+    if (n > 0) {
+      outcome_.out.append(buffer, static_cast<std::size_t>(n));
+      return true;
     }
-    return true;
+    close(out_);
+    out_ = -1;
+    return false;
   }
 
+  TemporaryDirectory dir_;
   pid_t pid_ = -1;
-  int fds_[2] = {-1, -1};  // stdout, stderr
+  int out_ = -1;
   bool reaped_ = false;
   Outcome outcome_;
   const Clock::time_point deadline_ = Clock::now() + std::chrono::seconds(120);
