@@ -19,9 +19,9 @@ const char kFullReport[] =
 
 std::string gpsdAt(int port) { return "gpsd:127.0.0.1:" + std::to_string(port); }
 
-TEST(GpsdLocationManager, AbsentGpsdLeavesTheServiceDisabled) {
-  const int closedPort = freePort(SOCK_STREAM);
-  for (const std::string& env : {gpsdAt(closedPort), std::string("gpsd:no-such-host.invalid")}) {
+TEST(GpsdLocationManager, AbsentGpsdLeavesTheServiceDisabledUntilItStarts) {
+  const int port = freePort(SOCK_STREAM);
+  for (const std::string& env : {gpsdAt(port), std::string("gpsd:no-such-host.invalid")}) {
     SCOPED_TRACE(env);
     EnvScope gnss("LODESTACK_GNSS", env);
     const auto start = Clock::now();
@@ -37,10 +37,7 @@ TEST(GpsdLocationManager, AbsentGpsdLeavesTheServiceDisabled) {
     }
     EXPECT_LT(core::testing::secondsSince(start), 1.5);
   }
-}
 
-TEST(GpsdLocationManager, ConnectsWhenGpsdStartsLater) {
-  const int port = freePort(SOCK_STREAM);
   EnvScope gnss("LODESTACK_GNSS", gpsdAt(port));
   StateLog log;
   ASSERT_TRUE(runUntil([&] { return log.last(LOCATION_SERVICE_DISABLED); }, 2.0));
@@ -58,7 +55,7 @@ TEST(GpsdLocationManager, HandsOverReportsAndFillsWhatGpsdLeavesOut) {
   FakeGpsd gpsd;
   EnvScope gnss("LODESTACK_GNSS", gpsdAt(gpsd.port()));
   StateLog log;
-  ASSERT_TRUE(runUntil([&] { return gpsd.connected() && !log.states.empty(); }, 2.0));
+  ASSERT_TRUE(runUntil([&] { return gpsd.accepted() == 1 && !log.states.empty(); }, 2.0));
   EXPECT_TRUE(log.last(LOCATION_SERVICE_DISABLED)) << "connected, but no fix yet";
   EXPECT_EQ(log.location().result, LOCATION_ERROR_NO_POSITION);
 
@@ -116,7 +113,7 @@ TEST(GpsdLocationManager, HandsOverReportsAndFillsWhatGpsdLeavesOut) {
   EXPECT_TRUE(log.onTestThread);
 }
 
-TEST(GpsdLocationManager, DisablesWhenFixesStop) {
+TEST(GpsdLocationManager, DisablesWhenFixesStopAndRecoversFromClosedOrOverflowingConnections) {
   FakeGpsd gpsd;
   gpsd.greeting = kFullReport;
   EnvScope gnss("LODESTACK_GNSS", gpsdAt(gpsd.port()));
@@ -129,15 +126,9 @@ TEST(GpsdLocationManager, DisablesWhenFixesStop) {
   EXPECT_LT(silent, 4.0);
   EXPECT_EQ(log.location().result, LOCATION_ERROR_NO_POSITION);
   EXPECT_EQ(gpsd.accepted(), 1) << "a quiet gpsd keeps its connection";
-}
 
-TEST(GpsdLocationManager, RecoversFromClosedAndOverflowingConnections) {
-  FakeGpsd gpsd;
-  gpsd.greeting = kFullReport;
-  EnvScope gnss("LODESTACK_GNSS", gpsdAt(gpsd.port()));
-  StateLog log;
+  gpsd.send(kFullReport);
   ASSERT_TRUE(runUntil([&] { return log.last(LOCATION_SERVICE_ENABLED); }, 2.0));
-
   gpsd.dropClient();
   ASSERT_TRUE(runUntil([&] { return log.last(LOCATION_SERVICE_DISABLED); }, 1.0))
       << "a closed connection disables at once";
@@ -154,7 +145,8 @@ TEST(GpsdLocationManager, RecoversFromClosedAndOverflowingConnections) {
       std::find(log.states.begin(), log.states.end(), LOCATION_SERVICE_ENABLED), log.states.end());
   EXPECT_EQ(after, (std::vector<location_service_state_e>{
                        LOCATION_SERVICE_ENABLED, LOCATION_SERVICE_DISABLED, LOCATION_SERVICE_ENABLED,
-                       LOCATION_SERVICE_DISABLED, LOCATION_SERVICE_ENABLED}));
+                       LOCATION_SERVICE_DISABLED, LOCATION_SERVICE_ENABLED, LOCATION_SERVICE_DISABLED,
+                       LOCATION_SERVICE_ENABLED}));
   EXPECT_TRUE(log.onTestThread);
 }
 

@@ -1,20 +1,16 @@
-// Helpers of the gpsd tests: the environment, free loopback ports, a fake
-// gpsd that the test scripts line by line, the real gpsd as a child process,
-// an NMEA feed for it, and a location manager whose state changes are kept.
-// Everything runs on the test thread's dispatcher.
+// Helpers of the gpsd tests: free loopback ports, a fake gpsd that the test
+// scripts line by line, the real gpsd as a child process, an NMEA feed for
+// it, and a location manager whose state changes are kept. The fake, the
+// feed and the location manager run on the test thread's dispatcher.
 #ifndef LODESTACK_TESTS_PLATFORM_GPSDTESTSUPPORT_H
 #define LODESTACK_TESTS_PLATFORM_GPSDTESTSUPPORT_H
 
 #include <arpa/inet.h>
-#include <fcntl.h>
 #include <netinet/in.h>
-#include <signal.h>
 #include <sys/socket.h>
-#include <sys/wait.h>
 #include <unistd.h>
 
 #include <cstdio>
-#include <cstdlib>
 #include <ctime>
 #include <string>
 #include <thread>
@@ -25,6 +21,7 @@
 #include <lodestack/lodestack.h>
 
 #include "core/CoreTestSupport.h"
+#include "platform/PlatformTestSupport.h"
 
 namespace lodestack {
 namespace testing {
@@ -44,26 +41,6 @@ inline void runFor(double seconds) {
   runUntil([] { return false; }, seconds);
 }
 
-// Sets an environment variable for one scope.
-class EnvScope {
- public:
-  EnvScope(const char* name, const std::string& value) : name_(name) {
-    if (const char* old = std::getenv(name)) old_ = old, hadOld_ = true;
-    setenv(name, value.c_str(), 1);
-  }
-  ~EnvScope() {
-    if (hadOld_)
-      setenv(name_, old_.c_str(), 1);
-    else
-      unsetenv(name_);
-  }
-
- private:
-  const char* name_;
-  std::string old_;
-  bool hadOld_ = false;
-};
-
 inline sockaddr_in loopbackAddress(int port) {
   sockaddr_in a{};
   a.sin_family = AF_INET;
@@ -72,15 +49,21 @@ inline sockaddr_in loopbackAddress(int port) {
   return a;
 }
 
+// Binds `fd` to the loopback port `port` (0: any free one); returns the
+// port, or -1.
+inline int bindLoopback(int fd, int port = 0) {
+  sockaddr_in a = loopbackAddress(port);
+  socklen_t size = sizeof a;
+  if (bind(fd, reinterpret_cast<sockaddr*>(&a), sizeof a) != 0 ||
+      getsockname(fd, reinterpret_cast<sockaddr*>(&a), &size) != 0)
+    return -1;
+  return ntohs(a.sin_port);
+}
+
 // A loopback port of `type` that nobody used a moment ago.
 inline int freePort(int type) {
   const int fd = socket(AF_INET, type, 0);
-  sockaddr_in a = loopbackAddress(0);
-  socklen_t size = sizeof a;
-  int port = -1;
-  if (bind(fd, reinterpret_cast<sockaddr*>(&a), sizeof a) == 0 &&
-      getsockname(fd, reinterpret_cast<sockaddr*>(&a), &size) == 0)
-    port = ntohs(a.sin_port);
+  const int port = bindLoopback(fd);
   close(fd);
   return port;
 }
@@ -98,16 +81,12 @@ inline bool accepting(int port) {
 // closes.
 class StalledListener {
  public:
-  StalledListener() : fd_(socket(AF_INET, SOCK_STREAM, 0)) {
-    sockaddr_in a = loopbackAddress(0);
-    socklen_t size = sizeof a;
-    if (bind(fd_, reinterpret_cast<sockaddr*>(&a), sizeof a) == 0 && listen(fd_, 0) == 0 &&
-        getsockname(fd_, reinterpret_cast<sockaddr*>(&a), &size) == 0)
-      port_ = ntohs(a.sin_port);
-    for (int i = 0; i < 3; ++i) {
-      const int c = socket(AF_INET, SOCK_STREAM | SOCK_NONBLOCK, 0);
+  StalledListener() : fd_(socket(AF_INET, SOCK_STREAM, 0)), port_(bindLoopback(fd_)) {
+    listen(fd_, 0);
+    const sockaddr_in a = loopbackAddress(port_);
+    for (int& c : clients_) {
+      c = socket(AF_INET, SOCK_STREAM | SOCK_NONBLOCK, 0);
       (void)connect(c, reinterpret_cast<const sockaddr*>(&a), sizeof a);
-      clients_.push_back(c);
     }
   }
   ~StalledListener() {
@@ -117,24 +96,22 @@ class StalledListener {
   int port() const { return port_; }
 
  private:
-  int fd_, port_ = -1;
-  std::vector<int> clients_;
+  int fd_, port_;
+  int clients_[3];
 };
 
 // A TCP server on the loopback speaking for gpsd: it accepts one client at a
-// time, discards what the client sends, and writes what the test says, with
-// `greeting` right after each accept.
+// time (a new one replaces the last), ignores what the client sends, and
+// writes what the test says, with `greeting` right after each accept.
 class FakeGpsd : public core::IPollSink {
  public:
-  explicit FakeGpsd(int port = 0) : dispatcher_(SharedPointer<core::LinAsyncCallDispatcher>::cast(loop())) {
-    listenFd_ = socket(AF_INET, SOCK_STREAM | SOCK_NONBLOCK, 0);
+  explicit FakeGpsd(int port = 0)
+      : dispatcher_(SharedPointer<core::LinAsyncCallDispatcher>::cast(loop())),
+        listenFd_(socket(AF_INET, SOCK_STREAM | SOCK_NONBLOCK, 0)) {
     const int one = 1;
     setsockopt(listenFd_, SOL_SOCKET, SO_REUSEADDR, &one, sizeof one);
-    sockaddr_in a = loopbackAddress(port);
-    socklen_t size = sizeof a;
-    if (bind(listenFd_, reinterpret_cast<sockaddr*>(&a), sizeof a) == 0 && listen(listenFd_, 4) == 0 &&
-        getsockname(listenFd_, reinterpret_cast<sockaddr*>(&a), &size) == 0)
-      port_ = ntohs(a.sin_port);
+    port_ = bindLoopback(listenFd_, port);
+    listen(listenFd_, 4);
     dispatcher_->attachPollSink({listenFd_, POLLIN, 0}, this);
   }
   ~FakeGpsd() override {
@@ -145,46 +122,41 @@ class FakeGpsd : public core::IPollSink {
 
   int port() const { return port_; }
   int accepted() const { return accepted_; }
-  bool connected() const { return clientFd_ >= 0; }
   std::string greeting;
 
-  // Writes `text` to the client; false when there is none.
+  // Writes `text` to the client; false when there is none or it left.
   bool send(const std::string& text) {
-    if (clientFd_ < 0) return false;
-    std::size_t done = 0;
-    while (done < text.size()) {
-      const ssize_t n = write(clientFd_, text.data() + done, text.size() - done);
+    for (std::size_t done = 0; done < text.size();) {
+      const ssize_t n = ::send(clientFd_, text.data() + done, text.size() - done, MSG_NOSIGNAL);
       if (n <= 0) return false;
       done += static_cast<std::size_t>(n);
     }
     return true;
   }
 
+  // Closes the connection. What the client sent is discarded first: a
+  // close over unread input would reset the connection instead.
   void dropClient() {
     if (clientFd_ < 0) return;
-    dispatcher_->detachPollSink({clientFd_, POLLIN, 0});
+    char discard[512];
+    while (recv(clientFd_, discard, sizeof discard, MSG_DONTWAIT) > 0) {
+    }
     close(clientFd_);
     clientFd_ = -1;
   }
 
-  void handlePollEvent(const pollfd& p) override {
-    if (p.fd == listenFd_) {
-      const int fd = accept(listenFd_, nullptr, nullptr);
-      if (fd < 0) return;
-      dropClient();
-      clientFd_ = fd;
-      ++accepted_;
-      dispatcher_->attachPollSink({clientFd_, POLLIN, 0}, this);
-      send(greeting);
-    } else if (p.fd == clientFd_) {
-      char buffer[512];
-      if (read(clientFd_, buffer, sizeof buffer) <= 0) dropClient();
-    }
+  void handlePollEvent(const pollfd&) override {
+    const int fd = accept(listenFd_, nullptr, nullptr);
+    if (fd < 0) return;
+    dropClient();
+    clientFd_ = fd;
+    ++accepted_;
+    send(greeting);
   }
 
  private:
   SharedPointer<core::LinAsyncCallDispatcher> dispatcher_;
-  int listenFd_ = -1, clientFd_ = -1, port_ = -1, accepted_ = 0;
+  int listenFd_, clientFd_ = -1, port_ = -1, accepted_ = 0;
 };
 
 // A location manager made from the current LODESTACK_GNSS, keeping every
@@ -237,47 +209,25 @@ inline bool gpsdInstalled() { return access(kGpsd, X_OK) == 0; }
 
 // gpsd on loopback port `port`, reading NMEA datagrams sent to the loopback
 // UDP port `feedPort`; its output is discarded. A shell keeps it and ends it
-// when the test closes its end of a pipe, or dies (gpsd, started as root,
-// drops its privileges and with them any signal asked for on our death).
+// when ended itself: gpsd, started as root, drops its privileges and with
+// them the signal asked for on the test's death.
 class GpsdProcess {
  public:
   GpsdProcess(int port, int feedPort) : port_(port), feedPort_(feedPort) {}
-  ~GpsdProcess() { stop(); }
 
-  // Starts gpsd and waits (on the loop) until it accepts connections.
+  // Starts gpsd and waits until it accepts connections.
   bool start() {
-    const std::string script = std::string(kGpsd) + " -N -n -S " + std::to_string(port_) +
-                               " udp://127.0.0.1:" + std::to_string(feedPort_) +
-                               " >/dev/null 2>&1 & read x; kill $!; wait $!";
-    int keep[2];
-    if (pipe2(keep, O_CLOEXEC) != 0) return false;
-    pid_ = fork();
-    if (pid_ == 0) {
-      dup2(keep[0], 0);
-      execl("/bin/sh", "sh", "-c", script.c_str(), static_cast<char*>(nullptr));
-      _exit(127);
-    }
-    close(keep[0]);
-    keepFd_ = keep[1];
-    return pid_ > 0 && runUntil([this] { return accepting(port_); }, 5.0);
+    const std::string script = "trap 'kill $p; wait $p' TERM; " + std::string(kGpsd) + " -N -n -S " +
+                               std::to_string(port_) + " udp://127.0.0.1:" +
+                               std::to_string(feedPort_) + " >/dev/null 2>&1 & p=$!; wait $p";
+    return shell_.start({"/bin/sh", "-c", script}) &&
+           waitFor([this] { return accepting(port_); }, 5.0);
   }
-
-  void stop() {
-    if (keepFd_ >= 0) close(keepFd_);
-    keepFd_ = -1;
-    if (pid_ <= 0) return;
-    int status;
-    if (!runUntil([&] { return waitpid(pid_, &status, WNOHANG) == pid_; }, 3.0)) {
-      kill(pid_, SIGKILL);
-      waitpid(pid_, &status, 0);
-    }
-    pid_ = -1;
-  }
+  void stop() { shell_.stop(); }
 
  private:
   int port_, feedPort_;
-  int keepFd_ = -1;
-  pid_t pid_ = -1;
+  ChildProcess shell_;
 };
 
 // Sends a GGA and an RMC sentence for a fixed point, moving at 19.44 knots

@@ -7,97 +7,33 @@
 #ifndef LODESTACK_TESTS_PLATFORM_MOCKBUS_H
 #define LODESTACK_TESTS_PLATFORM_MOCKBUS_H
 
-#include <fcntl.h>
-#include <poll.h>
-#include <signal.h>
-#include <stdlib.h>
-#include <sys/prctl.h>
-#include <sys/wait.h>
-#include <unistd.h>
-
 #include <gio/gio.h>
 
-#include <algorithm>
-#include <chrono>
-#include <filesystem>
 #include <fstream>
+#include <memory>
 #include <string>
-#include <thread>
 #include <vector>
+
+#include "platform/PlatformTestSupport.h"
+#include "support/TemporaryDirectory.h"
 
 namespace lodestack {
 namespace testing {
 
-// A child process; stopped (SIGTERM, then reaped) with this object, and
-// killed by the kernel should the test die first.
-class ChildProcess {
- public:
-  // Runs argv (argv[0] searched on PATH); stdout goes to `stdoutFd` (-1:
-  // /dev/null), stderr to the file `stderrPath` when given.
-  bool start(const std::vector<std::string>& argv, int stdoutFd = -1,
-             const std::string& stderrPath = std::string()) {
-    const std::string program = find(argv[0]);
-    std::vector<char*> args;
-    for (const std::string& a : argv) args.push_back(const_cast<char*>(a.c_str()));
-    args.push_back(nullptr);
-    const pid_t parent = getpid();
-    pid_ = fork();
-    if (pid_ == 0) {  // only async-signal-safe calls until exec
-      prctl(PR_SET_PDEATHSIG, SIGKILL);
-      if (getppid() != parent) _exit(127);
-      const int out = stdoutFd >= 0 ? stdoutFd : open("/dev/null", O_WRONLY);
-      dup2(out, 1);
-      if (!stderrPath.empty()) {
-        const int err = open(stderrPath.c_str(), O_WRONLY | O_CREAT, 0600);
-        dup2(err, 2);
-      }
-      execv(program.c_str(), args.data());
-      _exit(127);
-    }
-    return pid_ > 0;
-  }
-  void stop() {
-    if (pid_ <= 0) return;
-    kill(pid_, SIGTERM);
-    int status;
-    waitpid(pid_, &status, 0);
-    pid_ = -1;
-  }
-  ~ChildProcess() { stop(); }
-
- private:
-  static std::string find(const std::string& name) {
-    if (name.find('/') != std::string::npos) return name;
-    const char* path = getenv("PATH");
-    std::string dirs = path ? path : "/usr/bin:/bin";
-    for (std::size_t from = 0; from <= dirs.size();) {
-      const std::size_t to = std::min(dirs.find(':', from), dirs.size());
-      const std::string candidate = dirs.substr(from, to - from) + "/" + name;
-      if (access(candidate.c_str(), X_OK) == 0) return candidate;
-      from = to + 1;
-    }
-    return name;
-  }
-
-  pid_t pid_ = -1;
-};
-
 class PrivateBus {
  public:
   PrivateBus() {
-    const char* tmp = getenv("TMPDIR");
-    std::string dir = std::string(tmp && *tmp ? tmp : "/tmp") + "/lodestack-bus-XXXXXX";
-    if (!mkdtemp(&dir[0])) {
+    if (dir_.path().empty()) {
       error_ = "no temporary folder";
       return;
     }
-    dir_ = dir;
-    std::ofstream(dir_ + "/bus.conf")
+    const std::string address = "unix:path=" + dir_.file("socket");
+    std::ofstream(dir_.file("bus.conf"))
         << "<!DOCTYPE busconfig PUBLIC \"-//freedesktop//DTD D-Bus Bus Configuration 1.0//EN\"\n"
            " \"http://www.freedesktop.org/standards/dbus/1.0/busconfig.dtd\">\n"
            "<busconfig>\n"
            "  <type>session</type>\n"
-           "  <listen>unix:path=" << dir_ << "/socket</listen>\n"
+           "  <listen>" << address << "</listen>\n"
            "  <auth>EXTERNAL</auth>\n"
            "  <policy context=\"default\">\n"
            "    <allow send_destination=\"*\" eavesdrop=\"true\"/>\n"
@@ -105,50 +41,34 @@ class PrivateBus {
            "    <allow own=\"*\"/>\n"
            "  </policy>\n"
            "</busconfig>\n";
-    int out[2];
-    if (pipe2(out, O_CLOEXEC) != 0) {
-      error_ = "no pipe";
+    if (!daemon_.start({"/usr/bin/dbus-daemon", "--config-file=" + dir_.file("bus.conf"),
+                        "--nofork", "--nopidfile"})) {
+      error_ = "dbus-daemon did not start";
       return;
     }
-    const bool started = daemon_.start({"dbus-daemon", "--config-file=" + dir_ + "/bus.conf",
-                                        "--nofork", "--nopidfile", "--print-address=1"},
-                                       out[1], dir_ + "/daemon.log");
-    close(out[1]);
-    if (started) address_ = readLine(out[0], 5000);
-    close(out[0]);
-    if (address_.empty()) {
-      error_ = "dbus-daemon did not start (is the dbus-daemon package installed?)";
-      return;
-    }
-    const char* previous = getenv("DBUS_SYSTEM_BUS_ADDRESS");
-    if (previous) previous_ = previous;
-    hadPrevious_ = previous != nullptr;
-    setenv("DBUS_SYSTEM_BUS_ADDRESS", address_.c_str(), 1);
     GError* e = nullptr;
-    connection_ = g_dbus_connection_new_for_address_sync(
-        address_.c_str(),
-        static_cast<GDBusConnectionFlags>(G_DBUS_CONNECTION_FLAGS_AUTHENTICATION_CLIENT |
-                                          G_DBUS_CONNECTION_FLAGS_MESSAGE_BUS_CONNECTION),
-        nullptr, nullptr, &e);
+    waitFor([&] {
+      g_clear_error(&e);
+      connection_ = g_dbus_connection_new_for_address_sync(
+          address.c_str(),
+          static_cast<GDBusConnectionFlags>(G_DBUS_CONNECTION_FLAGS_AUTHENTICATION_CLIENT |
+                                            G_DBUS_CONNECTION_FLAGS_MESSAGE_BUS_CONNECTION),
+          nullptr, nullptr, &e);
+      return connection_ != nullptr;
+    }, 5.0);
     if (!connection_) {
-      error_ = std::string("cannot connect to the private bus: ") + e->message;
+      error_ = std::string("cannot connect to the private bus (is the dbus-daemon package "
+                           "installed?): ") + e->message;
       g_error_free(e);
+      return;
     }
+    address_ = std::make_unique<EnvScope>("DBUS_SYSTEM_BUS_ADDRESS", address);
   }
   ~PrivateBus() {
     if (connection_) {
       g_dbus_connection_close_sync(connection_, nullptr, nullptr);
       g_object_unref(connection_);
     }
-    daemon_.stop();
-    if (!address_.empty()) {
-      if (hadPrevious_)
-        setenv("DBUS_SYSTEM_BUS_ADDRESS", previous_.c_str(), 1);
-      else
-        unsetenv("DBUS_SYSTEM_BUS_ADDRESS");
-    }
-    std::error_code ignored;
-    if (!dir_.empty()) std::filesystem::remove_all(dir_, ignored);
   }
   PrivateBus(const PrivateBus&) = delete;
   PrivateBus& operator=(const PrivateBus&) = delete;
@@ -193,25 +113,9 @@ class PrivateBus {
   }
 
  private:
-  static std::string readLine(int fd, int timeoutMs) {
-    std::string line;
-    const auto until = std::chrono::steady_clock::now() + std::chrono::milliseconds(timeoutMs);
-    while (std::chrono::steady_clock::now() < until) {
-      pollfd p{fd, POLLIN, 0};
-      if (poll(&p, 1, 100) <= 0) continue;
-      char c;
-      if (read(fd, &c, 1) != 1) break;
-      if (c == '\n') return line;
-      line += c;
-    }
-    return std::string();
-  }
-
-  std::string dir_;
-  std::string address_;
+  TemporaryDirectory dir_;  // first: outlives the daemon
   std::string error_;
-  std::string previous_;
-  bool hadPrevious_ = false;
+  std::unique_ptr<EnvScope> address_;
   ChildProcess daemon_;
   GDBusConnection* connection_ = nullptr;
 };
@@ -225,18 +129,8 @@ class MockService {
       : bus_(bus), busName_(std::move(busName)) {
     std::vector<std::string> argv = {"/usr/bin/python3", "-m", "dbusmock", "--system"};
     argv.insert(argv.end(), mockArgs.begin(), mockArgs.end());
-    if (!process_.start(argv)) {
-      error_ = "python3-dbusmock did not start";
-      return;
-    }
-    const auto until = std::chrono::steady_clock::now() + std::chrono::seconds(15);
-    while (!bus_.hasOwner(busName_)) {
-      if (std::chrono::steady_clock::now() > until) {
-        error_ = busName_ + " did not appear (is python3-dbusmock installed?)";
-        return;
-      }
-      std::this_thread::sleep_for(std::chrono::milliseconds(20));
-    }
+    if (!process_.start(argv) || !waitFor([&] { return bus_.hasOwner(busName_); }, 15.0))
+      error_ = busName_ + " did not appear (is python3-dbusmock installed?)";
   }
   MockService(const MockService&) = delete;
   MockService& operator=(const MockService&) = delete;
@@ -261,7 +155,7 @@ class MockService {
   // Ends the service and waits until its name is gone from the bus.
   void stop() {
     process_.stop();
-    while (bus_.hasOwner(busName_)) std::this_thread::sleep_for(std::chrono::milliseconds(10));
+    waitFor([&] { return !bus_.hasOwner(busName_); }, 5.0);
   }
 
  private:

@@ -10,28 +10,15 @@
 #include <gtest/gtest.h>
 
 #include "lodestack/platform/SecureStorage.h"
+#include "platform/PlatformTestSupport.h"
 #include "support/TemporaryDirectory.h"
 
 namespace lodestack {
 namespace {
 
+using testing::EnvScope;
 using testing::readText;
 using testing::TemporaryDirectory;
-
-// Sets an environment variable for one scope.
-class EnvironmentScope {
- public:
-  EnvironmentScope(const char* name, const char* value)
-      : name_(name), had_(getenv(name) != nullptr), old_(had_ ? getenv(name) : "") {
-    setenv(name, value, 1);
-  }
-  ~EnvironmentScope() { had_ ? setenv(name_.c_str(), old_.c_str(), 1) : unsetenv(name_.c_str()); }
-
- private:
-  std::string name_;
-  bool had_;
-  std::string old_;
-};
 
 // The entry's value, or "" with the error in `result`.
 std::string get(const char* name, int* result = nullptr) {
@@ -55,7 +42,7 @@ unsigned int modeOf(const std::string& path) {
 TEST(SecureStorage, PrivateFilesReplacedWhole) {
   TemporaryDirectory dir;
   const std::string storage = dir.file("nested/storage");
-  EnvironmentScope chosen("LODESTACK_SECURE_STORAGE_DIR", storage.c_str());
+  EnvScope chosen("LODESTACK_SECURE_STORAGE_DIR", storage);
   int result = 0;
   get("key", &result);
   EXPECT_EQ(result, -ENOENT);
@@ -84,7 +71,7 @@ TEST(SecureStorage, PrivateFilesReplacedWhole) {
 
 TEST(SecureStorage, BadNamesAndEntriesFailCleanly) {
   TemporaryDirectory dir;
-  EnvironmentScope chosen("LODESTACK_SECURE_STORAGE_DIR", dir.path().c_str());
+  EnvScope chosen("LODESTACK_SECURE_STORAGE_DIR", dir.path());
   for (const char* name : {"", ".hidden", "a/b", "..", static_cast<const char*>(nullptr)}) {
     int result = 0;
     get(name, &result);
@@ -113,14 +100,14 @@ TEST(SecureStorage, BadNamesAndEntriesFailCleanly) {
 
 TEST(SecureStorage, DefaultLocationFollowsXdgThenHome) {
   TemporaryDirectory dir;
-  EnvironmentScope unchosen("LODESTACK_SECURE_STORAGE_DIR", "");
+  EnvScope unchosen("LODESTACK_SECURE_STORAGE_DIR", "");
   {
-    EnvironmentScope data("XDG_DATA_HOME", dir.file("data").c_str());
+    EnvScope data("XDG_DATA_HOME", dir.file("data"));
     ASSERT_EQ(put("a", "1"), 1);
   }
   EXPECT_EQ(readText(dir.file("data/lodestack/secure-storage/a")), "1");
-  EnvironmentScope relative("XDG_DATA_HOME", "relative/ignored");
-  EnvironmentScope home("HOME", dir.file("home").c_str());
+  EnvScope relative("XDG_DATA_HOME", "relative/ignored");
+  EnvScope home("HOME", dir.file("home"));
   ASSERT_EQ(put("b", "2"), 1);
   EXPECT_EQ(readText(dir.file("home/.local/share/lodestack/secure-storage/b")), "2");
   EXPECT_EQ(modeOf(dir.file("home/.local")), 0700u);
@@ -129,7 +116,7 @@ TEST(SecureStorage, DefaultLocationFollowsXdgThenHome) {
 // A reader running beside a writer sees one whole value or the other.
 TEST(SecureStorage, ConcurrentReadersNeverSeeHalfAValue) {
   TemporaryDirectory dir;
-  EnvironmentScope chosen("LODESTACK_SECURE_STORAGE_DIR", dir.path().c_str());
+  EnvScope chosen("LODESTACK_SECURE_STORAGE_DIR", dir.path());
   const std::string a(40000, 'a'), b(30000, 'b');
   ASSERT_EQ(put("k", a), 40000);
   std::atomic<bool> done{false};
