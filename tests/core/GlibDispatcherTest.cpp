@@ -10,45 +10,40 @@ namespace {
 
 using namespace testing;
 
-struct LoopState : CallLog {
-  GMainLoop* loop = nullptr;
-  IAsyncCallDispatcher* dispatcher = nullptr;
-  int ticks = 0;
-};
-LoopState* gState = nullptr;
-
-void quitLoop(void*) { g_main_loop_quit(gState->loop); }
+void quitLoop(void* loop) { g_main_loop_quit(static_cast<GMainLoop*>(loop)); }
 
 // Ticks three times, then stops and queues the call that quits the loop.
 struct Ticker : ITimerObserver {
+  IAsyncCallDispatcher* dispatcher = nullptr;
+  GMainLoop* loop = g_main_loop_new(nullptr, FALSE);
+  int ticks = 0;
+  ~Ticker() override { g_main_loop_unref(loop); }
   void timeout(ITimer* timer) override {
-    if (++gState->ticks == 3) {
+    if (++ticks == 3) {
       EXPECT_EQ(timer->stop(), 0);
-      gState->dispatcher->queueAsyncCall(&quitLoop, nullptr);
+      dispatcher->queueAsyncCall(&quitLoop, loop);
     }
   }
 };
 
 // Queued calls and timers run inside an application's own GMainLoop.
 TEST(GlibDispatcher, RunsInsideAnApplicationsMainLoop) {
-  LoopState state;
-  gState = &state;
-  gLog = &state;
+  CallLog log;
+  gLog = &log;
   SharedPointer<IAsyncCallDispatcher> dispatcher =
       AsyncCallDispatcher::openDispatcher(AsyncCallDispatcher::MainLoopGlib);
   ASSERT_TRUE(dispatcher);
-  state.dispatcher = dispatcher.get();
   Ticker ticker;
+  ticker.dispatcher = dispatcher.get();
   SharedPointer<ITimer> timer(ITimer::create(&ticker));
   ASSERT_TRUE(timer) << "the timer joins the thread's GLib dispatcher";
 
   FunctionThread producer([&] {
-    for (long i = 0; i < 500; ++i) state.dispatcher->queueAsyncCall(&logCall, asParam(i));
+    for (long i = 0; i < 500; ++i) ticker.dispatcher->queueAsyncCall(&logCall, asParam(i));
   });
   ASSERT_TRUE(producer.thread().wait());
   ASSERT_EQ(timer->start(20, 0), 0);
 
-  state.loop = g_main_loop_new(nullptr, FALSE);
   const guint guard = g_timeout_add_seconds(
       30,
       [](gpointer loop) -> gboolean {
@@ -56,16 +51,14 @@ TEST(GlibDispatcher, RunsInsideAnApplicationsMainLoop) {
         g_main_loop_quit(static_cast<GMainLoop*>(loop));
         return G_SOURCE_REMOVE;
       },
-      state.loop);
-  g_main_loop_run(state.loop);
+      ticker.loop);
+  g_main_loop_run(ticker.loop);
   g_source_remove(guard);
-  g_main_loop_unref(state.loop);
 
-  EXPECT_EQ(state.ticks, 3);
-  ASSERT_EQ(state.calls.size(), 500u) << "all queued calls ran before the quit";
-  for (long i = 0; i < 500; ++i) ASSERT_EQ(state.calls[i], i);
-  EXPECT_TRUE(state.allOnOwner);
-  gState = nullptr;
+  EXPECT_EQ(ticker.ticks, 3);
+  ASSERT_EQ(log.calls.size(), 500u) << "all queued calls ran before the quit";
+  for (long i = 0; i < 500; ++i) ASSERT_EQ(log.calls[i], i);
+  EXPECT_TRUE(log.allOnOwner);
   gLog = nullptr;
 }
 
