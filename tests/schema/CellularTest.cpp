@@ -19,25 +19,47 @@ Bytes bytesAfterVersion(const SharedPointer<R>& r) {
   return Bytes(b.begin() + 1, b.end());
 }
 
-// A generic object holding every record as a code-14 property.
-SharedPointer<gom::GenericObject> objectOfAllRecords() {
+using Records = std::vector<SharedPointer<gom::ObjectBase>>;
+
+// A generic object holding each record as a code-14 property.
+SharedPointer<gom::GenericObject> objectOf(const Records& records) {
   SharedPointer<gom::GenericObject> o = gom::GenericObject::create(500);
-  for (const SharedPointer<gom::ObjectBase>& r : sample::allRecords()) {
+  for (const SharedPointer<gom::ObjectBase>& r : records) {
     EXPECT_EQ(Ok, o->setObjectProperty(r->key(), r));
   }
   return o;
+}
+
+// Every record type the factory knows: the cellular samples, then the
+// position, WLAN and GNSS records with some values set.
+Records everyRecordType() {
+  Records records = sample::allRecords();
+  SharedPointer<PositionEstimate> position =
+      PositionEstimate::create(47.5, 8.25, 100.0, 50.0, 30.0, 9u);
+  position->setTechnology(PositionEstimate::TechnologyGnss | PositionEstimate::TechnologyWlan);
+  const unsigned char mac[6] = {0xA0, 0xB1, 0xC2, 0xD3, 0xE4, 0xF5};
+  SharedPointer<WlanDn> dn = WlanDn::create();
+  EXPECT_EQ(Ok, dn->setBssid(mac, 6));
+  SharedPointer<WlanApMeasurement> ap = WlanApMeasurement::create();
+  ap->setRxLevel(-50);
+  ap->setRssi(200);
+  records.insert(records.end(),
+                 {position, dn, ap,
+                  GnssMeasurementData::create(Coverage(1, 2, 25.0f), 0.0, 1.0, -180.0, 5.0)});
+  return records;
 }
 
 }  // namespace
 
 TEST(Cellular, FactoryAndEveryRecordInsideAGenericObject) {
   for (unsigned short id : {0, 99, 136}) EXPECT_FALSE(ObjectBaseFactory::createObject(id)) << id;
-  SharedPointer<gom::GenericObject> o = objectOfAllRecords();
+  const Records records = everyRecordType();
+  SharedPointer<gom::GenericObject> o = objectOf(records);
   const Bytes bytes = bytesOf(*o);
   SharedPointer<gom::GenericObject> back = gom::GenericObject::create(1);
   ASSERT_TRUE(readFrom(*back, bytes));
   EXPECT_TRUE(*back == *o);
-  for (const SharedPointer<gom::ObjectBase>& r : sample::allRecords()) {
+  for (const SharedPointer<gom::ObjectBase>& r : records) {
     SharedPointer<gom::ObjectBase> empty = ObjectBaseFactory::createObject(r->key());
     ASSERT_TRUE(empty) << r->key();
     EXPECT_TRUE(empty->key() == r->key() && typeid(*empty) == typeid(*r)) << r->key();
@@ -82,9 +104,7 @@ TEST(Cellular, MasksAndWidths) {
   fdd->setLac(0x0102);
   ASSERT_EQ(Ok, fdd->setUarfcnUl(0x0A0B));
   fdd->nwMeasurement()->setRscp(-5);
-  EXPECT_EQ(0x81, fdd->presenceMask());
   EXPECT_EQ((Bytes{0x81, 0x02, 0x01, 1, 2 | 32, 0x0B, 0x0A, 0xFB}), bytesAfterVersion(fdd));
-  EXPECT_EQ(-5, fdd->nwMeasurement()->rscp());
 
   // UTRA ucid split and merge; the merge does not mask the RNC id.
   EXPECT_EQ(0x12340011u, UtraCellDn::mergeUcid(0x1234, 0x11));
@@ -168,7 +188,6 @@ TEST(Cellular, CellMeasurementsAcceptTheirOwnNetworkMeasurements) {
 
 TEST(Cellular, CellsAndNeighbours) {
   SharedPointer<GeranCell> cell = sample::full<GeranCell>();
-  EXPECT_EQ(2u, cell->currentNeighbors().size());
   SharedPointer<GeranCell> copy = GeranCell::create(cell);
   EXPECT_TRUE(*copy == *cell);
   EXPECT_NE(copy->neighbors()[0].get(), cell->neighbors()[0].get()) << "deep copy";
@@ -177,15 +196,13 @@ TEST(Cellular, CellsAndNeighbours) {
   copy->neighbors().removeAt(1);
   EXPECT_FALSE(*copy == *cell);
 
-  // The neighbour list travels after the cell's own fields.
+  // The neighbour list travels after the cell's own fields: cut short, the
+  // read fails and leaves the cell cleared, neighbours included.
   Bytes bytes = bytesOf(*cell);
-  SharedPointer<GeranCell> back = GeranCell::create();
-  ASSERT_TRUE(readFrom(*back, bytes));
-  EXPECT_TRUE(*back == *cell);
   bytes.pop_back();
-  EXPECT_FALSE(readFrom(*back, bytes));
-  EXPECT_EQ(0, back->presenceMask());
-  EXPECT_TRUE(back->currentNeighbors().empty()) << "a failed read leaves the cell cleared";
+  EXPECT_FALSE(readFrom(*copy, bytes));
+  EXPECT_EQ(0, copy->presenceMask());
+  EXPECT_TRUE(copy->currentNeighbors().empty());
 }
 
 // The object reader's fuzz seeds double as the pinned byte format of every
@@ -213,6 +230,6 @@ TEST(Cellular, FuzzSeedsPinTheByteFormat) {
     ASSERT_EQ(Ok, v.setObjectValue(r));
     check("record_" + std::to_string(r->key()), 1, v);
   }
-  check("all_records", 0, *objectOfAllRecords());
+  check("all_records", 0, *objectOf(sample::allRecords()));
   check("measurement_container", 0, *sample::fullContainer());
 }

@@ -45,9 +45,8 @@ TEST(Record, PresenceSettersAndEquality) {
   y->setB(77);
   EXPECT_FALSE(*x == *y) << "a present value against an absent one";
   x->setB(78);
-  EXPECT_FALSE(*x == *y);
+  EXPECT_FALSE(x->compare(y.get()));
   x->setB(77);
-  EXPECT_TRUE(x->compare(y.get()));
 
   // The ObjectBase part decides last.
   y->extension();
