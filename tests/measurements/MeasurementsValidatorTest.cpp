@@ -56,7 +56,9 @@ TEST(MeasurementsValidator, MeasurementsWithoutWhatPositioningNeedsAreRemoved) {
   };
   const std::vector<Case> cases = {
       {"GERAN without time stamp", 300,
-       sampleWith<GeranCellMeasurement>(300, [](auto& m) { m.unset(MeasurementBase::kTimeStamp); }), 0},
+       sampleWith<GeranCellMeasurement>(300,
+                                        [](auto& m) { m.unset(MeasurementBase::kTimeStamp); }),
+       0},
       {"UTRA-FDD identity without ucid", 301,
        sampleWith<UtraFddCellMeasurement>(301, [](auto& m) { m.dn()->unset(4); }), 0},
       {"GERAN identity without cid", 300,
