@@ -33,9 +33,10 @@ class LODESTACK_EXPORT MeasurementsValidator {
   MeasurementsValidator() = delete;
 
   // Validates every measurement of the container's collection `collectionId`
-  // (300 GERAN, 301 UTRA-FDD, 302 UTRA-TDD, 310 E-UTRA, 312 CDMA; other ids
-  // are left alone) and removes the invalid ones and elements without an
-  // object.
+  // (300 GERAN, 301 UTRA-FDD, 302 UTRA-TDD, 310 E-UTRA, 312 CDMA) and removes
+  // the invalid ones and elements without an object. A collection that is
+  // empty on entry is removed whatever its id; the elements of a non-empty
+  // collection under any other id are left alone.
   static void validateMeasurementCollection(unsigned short collectionId,
                                             gom::SharedPointer<gom::GenericObject>& container);
   // Removes the invalid entries of `measurement`'s neighbour collection (303);
