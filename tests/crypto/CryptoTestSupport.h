@@ -5,9 +5,7 @@
 
 #include <openssl/evp.h>
 #include <stdlib.h>
-#include <sys/stat.h>
 
-#include <filesystem>
 #include <string>
 #include <vector>
 
@@ -32,34 +30,19 @@ inline std::string toHex(const Bytes& bytes) {
   return hex;
 }
 
-// Points the host secure storage at a fresh directory for one scope.
+// Points the host secure storage at a fresh directory, `path()`, for one
+// scope; the directory itself is made by the storage when it first keeps a
+// key.
 class SecureStorageScope {
  public:
-  SecureStorageScope() : dir_(directory_.file("storage")) {
-    setenv("LODESTACK_SECURE_STORAGE_DIR", dir_.c_str(), 1);
-  }
+  SecureStorageScope() { setenv("LODESTACK_SECURE_STORAGE_DIR", path().c_str(), 1); }
   ~SecureStorageScope() { unsetenv("LODESTACK_SECURE_STORAGE_DIR"); }
 
-  std::vector<std::string> entries() const {
-    std::vector<std::string> names;
-    std::error_code ignored;
-    for (const auto& item : std::filesystem::directory_iterator(dir_, ignored))
-      names.push_back(item.path().filename().string());
-    return names;
-  }
-  Bytes entry(const std::string& name) const { return readBytes(dir_ + "/" + name); }
-  void put(const std::string& name, const Bytes& bytes) {
-    mkdir(dir_.c_str(), 0700);
-    writeBytes(dir_ + "/" + name, bytes);
-  }
-  void makeDirectoryEntry(const std::string& name) {
-    mkdir(dir_.c_str(), 0700);
-    mkdir((dir_ + "/" + name).c_str(), 0700);
-  }
+  std::string path() const { return directory_.file("storage"); }
+  std::string entry(const std::string& name) const { return path() + "/" + name; }
 
  private:
   TemporaryDirectory directory_;
-  std::string dir_;
 };
 
 inline Bytes keyAndIvOf(ICryptographyUtility& utility) {

@@ -1,5 +1,7 @@
 #include <openssl/evp.h>
+#include <sys/stat.h>
 
+#include <filesystem>
 #include <memory>
 #include <vector>
 
@@ -39,7 +41,7 @@ Bytes run(CryptoLinux& crypto, bool encrypting, const EVP_CIPHER* cipher, const 
 const Bytes kKey = fromHex("2b7e151628aed2a6abf7158809cf4f3c");
 const Bytes kPlain = fromHex("6bc1bee22e409f96e93d7e117393172a");
 
-TEST(CryptoLinux, KnownAnswers) {
+TEST(CryptoLinux, KnownAnswersPaddingAndRefusals) {
   CryptoLinux crypto;
   EXPECT_EQ(run(crypto, true, EVP_aes_128_ctr(), kPlain, kKey, fromHex("f0f1f2f3f4f5f6f7f8f9fafbfcfdfeff")),
             fromHex("874d6191b620e3261bef6864990db6ce"));
@@ -49,10 +51,7 @@ TEST(CryptoLinux, KnownAnswers) {
   unsigned char digest[16];
   ASSERT_EQ(crypto.md5Hash(reinterpret_cast<const unsigned char*>("abc"), 3, digest), Ok);
   EXPECT_EQ(Bytes(digest, digest + 16), fromHex("900150983cd24fb0d6963f7d28e17f72"));
-}
 
-TEST(CryptoLinux, CbcPaddingAndRefusals) {
-  CryptoLinux crypto;
   const Bytes iv(16, 7);
   for (size_t n : {0, 15, 17}) {
     const Bytes plain(n, static_cast<unsigned char>(n));
@@ -113,7 +112,7 @@ TEST(CryptoUtility, BuiltInStoreNeedsNoStorage) {
   std::unique_ptr<ICryptographyUtility> two(ICryptographyUtility::open("sltdb", status));
   ASSERT_TRUE(one && two);
   EXPECT_EQ(testing::keyAndIvOf(*one), testing::keyAndIvOf(*two)) << "constant material";
-  EXPECT_TRUE(storage.entries().empty());
+  EXPECT_FALSE(std::filesystem::exists(storage.path()));
   // The cipher opens on demand although the built-in store skips init.
   Call sealed, opened;
   ASSERT_EQ(one->encrypt(kPlain.data(), kPlain.size(), sealed.data, sealed.length), Ok);
@@ -121,12 +120,12 @@ TEST(CryptoUtility, BuiltInStoreNeedsNoStorage) {
   EXPECT_EQ(opened.bytes(), kPlain);
 }
 
-TEST(CryptoUtility, StoreKeyIsCreatedOnceAndCleared) {
+TEST(CryptoUtility, StoreKeysAreCreatedOnceReplacedWhenUnusableAndCleared) {
   testing::SecureStorageScope storage;
   Status status = Failed;
   std::unique_ptr<ICryptographyUtility> first(ICryptographyUtility::open("results", status));
   ASSERT_EQ(status, Ok);
-  const Bytes stored = storage.entry("results");
+  const Bytes stored = testing::readBytes(storage.entry("results"));
   ASSERT_EQ(stored.size(), 32u);
   EXPECT_EQ(testing::keyAndIvOf(*first), stored);
   std::unique_ptr<ICryptographyUtility> second(ICryptographyUtility::open("results", status));
@@ -134,24 +133,21 @@ TEST(CryptoUtility, StoreKeyIsCreatedOnceAndCleared) {
   EXPECT_EQ(testing::keyAndIvOf(*second), stored) << "the stored key is reused";
 
   EXPECT_TRUE(ICryptographyUtility::clear("results"));
-  EXPECT_TRUE(storage.entries().empty());
+  EXPECT_TRUE(std::filesystem::is_empty(storage.path()));
   EXPECT_TRUE(ICryptographyUtility::clear("results")) << "no key afterwards either way";
   std::unique_ptr<ICryptographyUtility> third(ICryptographyUtility::open("results", status));
   ASSERT_EQ(status, Ok);
   EXPECT_NE(testing::keyAndIvOf(*third), stored);
-}
 
-TEST(CryptoUtility, UnusableStoredKeysAreReplacedOrFail) {
-  testing::SecureStorageScope storage;
-  storage.put("short", Bytes(10, 'a'));
-  Status status = Failed;
+  testing::writeBytes(storage.entry("short"), Bytes(10, 'a'));
   std::unique_ptr<ICryptographyUtility> replaced(ICryptographyUtility::open("short", status));
   ASSERT_EQ(status, Ok);
-  EXPECT_EQ(testing::keyAndIvOf(*replaced), storage.entry("short")) << "a fresh key took its place";
+  EXPECT_EQ(testing::keyAndIvOf(*replaced), testing::readBytes(storage.entry("short")))
+      << "a fresh key took its place";
 
   // A directory where the entry should be: unreadable, and the fresh key
   // cannot take its place, so opening fails.
-  storage.makeDirectoryEntry("blocked");
+  ASSERT_EQ(0, mkdir(storage.entry("blocked").c_str(), 0700));
   EXPECT_EQ(ICryptographyUtility::open("blocked", status), nullptr);
   EXPECT_EQ(status, Failed);
   EXPECT_FALSE(ICryptographyUtility::clear("blocked"));
