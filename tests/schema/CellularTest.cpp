@@ -3,12 +3,11 @@
 #include <gtest/gtest.h>
 
 #include <cstdlib>
-#include <fstream>
-#include <iterator>
 #include <string>
 
 #include "schema/SampleRecords.h"
 #include "schema/SchemaTestSupport.h"
+#include "support/TemporaryDirectory.h"
 
 namespace {
 
@@ -217,13 +216,11 @@ TEST(Cellular, FuzzSeedsPinTheByteFormat) {
     bytes.insert(bytes.begin(), selector);
     const std::string path = dir + "/" + name;
     if (target) {
-      std::ofstream out(path, std::ios::binary);
-      out.write(reinterpret_cast<const char*>(bytes.data()), static_cast<std::streamsize>(bytes.size()));
-      return;
+      lodestack::testing::writeBytes(path, bytes);
+    } else {
+      EXPECT_EQ(lodestack::testing::readBytes(path), bytes)
+          << name << " no longer matches " << path;
     }
-    std::ifstream in(path, std::ios::binary);
-    const Bytes pinned((std::istreambuf_iterator<char>(in)), std::istreambuf_iterator<char>());
-    EXPECT_EQ(pinned, bytes) << name << " no longer matches " << path;
   };
   for (const SharedPointer<gom::ObjectBase>& r : sample::allRecords()) {
     gom::Variant v(7);

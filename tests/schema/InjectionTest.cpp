@@ -18,7 +18,6 @@ TEST(Injection, CellAndCellularObjectInjections) {
   EXPECT_EQ(s->addNeighborCellInjection(UtraFddNeighborCellInjection::create()->wrappedObject()),
             Refused)
       << "another technology's neighbour";
-  EXPECT_EQ(s->addNeighborCellInjection(SharedPointer<gom::GenericObject>()), Refused);
   EXPECT_EQ(s->neighborCellInjectionCollection()->size(), 1u);
   EXPECT_TRUE(s->valueExists(0x20));
   s->unset(0x21);

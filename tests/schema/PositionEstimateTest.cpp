@@ -53,9 +53,7 @@ TEST(PositionEstimate, SettersRangesAndIntegerViews) {
 }
 
 TEST(PositionEstimate, FactoriesBytesAndDump) {
-  EXPECT_FALSE(PositionEstimate::create(45.0, 0.0, 0u));
   EXPECT_FALSE(PositionEstimate::create(45.0, 0.0, 0.0, 1u)) << "zero circular error";
-  EXPECT_FALSE(PositionEstimate::create(45.0, 0.0, 100.0, 50.0, 180.0, 1u));
   SharedPointer<PositionEstimate> p = PositionEstimate::create(47.5, 8.25, 100.0, 50.0, 30.0, 9u);
   ASSERT_TRUE(p);
   EXPECT_EQ(p->presenceMask(), 1u | 2u | 4u | 16u | 32u | 64u);

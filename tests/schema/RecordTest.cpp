@@ -29,7 +29,6 @@ class Outer : public Record<Outer, 7002,
 TEST(Record, PresenceSettersAndEquality) {
   SharedPointer<Inner> x = Inner::create();
   SharedPointer<Inner> y = Inner::create();
-  EXPECT_FALSE(x->valueExists(1));
   EXPECT_EQ(Ok, x->setA(5));
   EXPECT_EQ(Ok, x->setC(-3));
   EXPECT_EQ(9, x->presenceMask());
