@@ -10,6 +10,7 @@
 #ifndef LODESTACK_CORE_IDIRECTORY_H
 #define LODESTACK_CORE_IDIRECTORY_H
 
+#include <algorithm>
 #include <list>
 #include <string>
 
@@ -30,8 +31,13 @@ class LODESTACK_EXPORT IDirectory : public gom::ReferenceCountable {
     unsigned int modificationTime = 0;
     std::wstring name;
   };
-  static bool lesserName(const Entry& a, const Entry& b) { return a.name < b.name; }
-  static bool greaterName(const Entry& a, const Entry& b) { return a.name > b.name; }
+  // Character by character rather than through std::wstring's compare, whose
+  // vector wmemcmp reads past the end of a name (harmless, but memory
+  // checkers such as valgrind report it).
+  static bool lesserName(const Entry& a, const Entry& b) {
+    return std::lexicographical_compare(a.name.begin(), a.name.end(), b.name.begin(), b.name.end());
+  }
+  static bool greaterName(const Entry& a, const Entry& b) { return lesserName(b, a); }
 
   ~IDirectory() override;
 
