@@ -10,6 +10,7 @@
 #include <lodestack/lodestack.h>
 
 #include "ResultsFile.h"
+#include "schema/SampleRecords.h"
 #include "support/TemporaryDirectory.h"
 
 namespace lodestack {
@@ -39,17 +40,12 @@ std::vector<std::size_t> recordOffsets(const Bytes& b) {
 
 class ResultsFileTest : public ::testing::Test {
  protected:
-  // A GSM cell, a timed-out request and a GNSS fix.
+  // Every kind of record, a timed-out request, and a GNSS fix.
   std::vector<Result> samples() const {
-    SharedPointer<schema::MeasurementContainer> cells = schema::MeasurementContainer::create();
-    EXPECT_EQ(Ok, cells->addGeranMeasurement(
-                      schema::GeranCellMeasurement::create(schema::GeranCellDn::create(244, 5, 1, 2),
-                                                           1700000000u)
-                          ->wrappedObject()));
     SharedPointer<schema::MeasurementContainer> fix = schema::MeasurementContainer::create();
     SharedPointer<schema::PositionEstimate> p = schema::PositionEstimate::create(60.0, 25.0, 1700000001u);
     EXPECT_EQ(Ok, fix->addGnssMeasurement(schema::GnssMeasurement::create(*p)->wrappedObject()));
-    return {Result{IMeasurementsObserver::Cellular, 1, Ok, cells->wrappedObject()},
+    return {Result{IMeasurementsObserver::Cellular, 1, Ok, sample::fullContainer()->wrappedObject()},
             Result{IMeasurementsObserver::Wlan, 2, Timeout, nullptr},
             Result{IMeasurementsObserver::Gnss, 0, Ok, fix->wrappedObject()}};
   }
