@@ -21,12 +21,12 @@ class GpsdIntegration : public AdaptationFixture {
  protected:
   void SetUp() override {
     if (!gpsdInstalled()) GTEST_SKIP() << kGpsd << " is missing: install Debian's gpsd package";
-    ASSERT_TRUE(gpsd.start()) << "gpsd did not start listening on port " << port;
+    ASSERT_TRUE(startGpsd(gpsd, port, feedPort)) << "gpsd did not start listening on port " << port;
   }
 
   const int port = freePort(SOCK_STREAM);
   const int feedPort = freePort(SOCK_DGRAM);
-  GpsdProcess gpsd{port, feedPort};
+  ChildProcess gpsd;
   NmeaFeed feed{feedPort};
   EnvScope gnss{"LODESTACK_GNSS", "gpsd:127.0.0.1:" + std::to_string(port)};
 };
@@ -61,7 +61,7 @@ TEST_P(GpsdIntegration, FixesFollowTheFeedAndGpsd) {
 
   gpsd.stop();
   EXPECT_TRUE(fixesStop()) << "fixes went on after gpsd stopped";
-  ASSERT_TRUE(gpsd.start());
+  ASSERT_TRUE(startGpsd(gpsd, port, feedPort));
   EXPECT_TRUE(fixesArrive(1)) << "no fixes after gpsd came back";
   EXPECT_TRUE(state.last(LOCATION_SERVICE_ENABLED));
   EXPECT_TRUE(state.onTestThread);

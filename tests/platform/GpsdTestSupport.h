@@ -207,28 +207,17 @@ class StateLog {
 const char kGpsd[] = "/usr/sbin/gpsd";
 inline bool gpsdInstalled() { return access(kGpsd, X_OK) == 0; }
 
-// gpsd on loopback port `port`, reading NMEA datagrams sent to the loopback
-// UDP port `feedPort`; its output is discarded. A shell keeps it and ends it
-// when ended itself: gpsd, started as root, drops its privileges and with
-// them the signal asked for on the test's death.
-class GpsdProcess {
- public:
-  GpsdProcess(int port, int feedPort) : port_(port), feedPort_(feedPort) {}
-
-  // Starts gpsd and waits until it accepts connections.
-  bool start() {
-    const std::string script = "trap 'kill $p; wait $p' TERM; " + std::string(kGpsd) + " -N -n -S " +
-                               std::to_string(port_) + " udp://127.0.0.1:" +
-                               std::to_string(feedPort_) + " >/dev/null 2>&1 & p=$!; wait $p";
-    return shell_.start({"/bin/sh", "-c", script}) &&
-           waitFor([this] { return accepting(port_); }, 5.0);
-  }
-  void stop() { shell_.stop(); }
-
- private:
-  int port_, feedPort_;
-  ChildProcess shell_;
-};
+// Starts gpsd in `shell` on loopback port `port`, reading NMEA datagrams
+// sent to the loopback UDP port `feedPort`, and waits until it accepts
+// connections. The shell ends gpsd when ended itself: gpsd, started as root,
+// drops its privileges and with them the signal asked for on the test's
+// death.
+inline bool startGpsd(ChildProcess& shell, int port, int feedPort) {
+  const std::string script = "trap 'kill $p; wait $p' TERM; " + std::string(kGpsd) + " -N -n -S " +
+                             std::to_string(port) + " udp://127.0.0.1:" + std::to_string(feedPort) +
+                             " & p=$!; wait $p";
+  return shell.start({"/bin/sh", "-c", script}) && waitFor([&] { return accepting(port); }, 5.0);
+}
 
 // Sends a GGA and an RMC sentence for a fixed point, moving at 19.44 knots
 // (10 m/s), to a loopback UDP port every 200 ms while running.

@@ -22,18 +22,10 @@ inline std::unique_ptr<MockService> startWpaSupplicant(PrivateBus& bus) {
 }
 
 const char* const kWpaInterfacePath = "/fi/w1/wpa_supplicant1/Interfaces/0";
-// Answers Scan with ScanDone 50 ms later.
-const char* const kScanThenScanDone =
-    "from gi.repository import GLib; GLib.timeout_add(50, lambda s=self: "
-    "s.EmitSignal(\"fi.w1.wpa_supplicant1.Interface\", \"ScanDone\", \"b\", [True]) or False)";
-const char* const kAccessDenied =
-    "raise dbus.exceptions.DBusException(\"not allowed\", "
-    "name=\"org.freedesktop.DBus.Error.AccessDenied\")";
 
-// One interface whose Scan runs `scanCode`, and its BSS objects: the
-// properties of each as GVariant text of an a{sv}.
-inline std::string setUpWpaSupplicant(MockService& wpa, const std::string& scanCode,
-                                      const std::vector<std::string>& bssProperties) {
+// One interface whose Scan is answered with ScanDone 50 ms later, and its
+// BSS objects: the properties of each as GVariant text of an a{sv}.
+inline std::string setUpWpaSupplicant(MockService& wpa, const std::vector<std::string>& bssProperties) {
   std::string paths;
   for (std::size_t i = 0; i < bssProperties.size(); ++i)
     paths += std::string(i ? ", " : "") + "'" + kWpaInterfacePath + "/BSSs/" + std::to_string(i) + "'";
@@ -41,21 +33,18 @@ inline std::string setUpWpaSupplicant(MockService& wpa, const std::string& scanC
       "/fi/w1/wpa_supplicant1", "AddProperties", "(sa{sv})",
       std::string("('fi.w1.wpa_supplicant1', {'Interfaces': <@ao ['") + kWpaInterfacePath + "']>})");
   if (failure.empty())
-    failure = wpa.mock("/fi/w1/wpa_supplicant1", "AddObject", "(ssa{sv}a(ssss))",
-                       std::string("('") + kWpaInterfacePath +
-                           "', 'fi.w1.wpa_supplicant1.Interface', {'Ifname': <'wlan0'>, "
-                           "'BSSs': <@ao [" + paths + "]>}, [('Scan', 'a{sv}', '', '" + scanCode +
-                           "')])");
+    failure = wpa.mock(
+        "/fi/w1/wpa_supplicant1", "AddObject", "(ssa{sv}a(ssss))",
+        std::string("('") + kWpaInterfacePath +
+            "', 'fi.w1.wpa_supplicant1.Interface', {'Ifname': <'wlan0'>, 'BSSs': <@ao [" + paths +
+            "]>}, [('Scan', 'a{sv}', '', 'from gi.repository import GLib; GLib.timeout_add(50, "
+            "lambda s=self: s.EmitSignal(\"fi.w1.wpa_supplicant1.Interface\", \"ScanDone\", "
+            "\"b\", [True]) or False)')])");
   for (std::size_t i = 0; failure.empty() && i < bssProperties.size(); ++i)
     failure = wpa.mock("/fi/w1/wpa_supplicant1", "AddObject", "(ssa{sv}a(ssss))",
                        std::string("('") + kWpaInterfacePath + "/BSSs/" + std::to_string(i) +
                            "', 'fi.w1.wpa_supplicant1.BSS', " + bssProperties[i] + ", [])");
   return failure;
-}
-
-inline std::string replaceWpaScan(MockService& wpa, const std::string& scanCode) {
-  return wpa.mock(kWpaInterfacePath, "AddMethod", "(sssss)",
-                  "('fi.w1.wpa_supplicant1.Interface', 'Scan', 'a{sv}', '', '" + scanCode + "')");
 }
 
 inline std::unique_ptr<MockService> startNetworkManager(PrivateBus& bus) {
@@ -94,6 +83,7 @@ inline std::string setUpNetworkManager(MockService& nm, const std::vector<MockAc
   return failure;
 }
 
+// The generic mock as an object manager, as ModemManager is.
 inline std::unique_ptr<MockService> startModemManager(PrivateBus& bus) {
   return std::make_unique<MockService>(
       bus, "org.freedesktop.ModemManager1",

@@ -52,7 +52,7 @@ inline bool waitFor(const std::function<bool()>& done, double seconds) {
   return true;
 }
 
-// Runs argv (argv[0] a full path) with its standard output discarded. Ended
+// Runs argv (argv[0] a full path) with its output discarded. Ended
 // by SIGTERM and reaped by stop() or with this object; the kernel sends the
 // SIGTERM itself should the test die first.
 class ChildProcess {
@@ -66,7 +66,9 @@ class ChildProcess {
     if (pid_ == 0) {  // only async-signal-safe calls until exec
       prctl(PR_SET_PDEATHSIG, SIGTERM);
       if (getppid() != parent) _exit(127);
-      dup2(open("/dev/null", O_WRONLY), 1);
+      const int discard = open("/dev/null", O_WRONLY);
+      dup2(discard, 1);
+      dup2(discard, 2);
       execv(args[0], args.data());
       _exit(127);
     }
