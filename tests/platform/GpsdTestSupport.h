@@ -77,45 +77,34 @@ inline bool accepting(int port) {
   return ok;
 }
 
-// A loopback listener whose queue is full: connecting to it hangs until it
-// closes.
-class StalledListener {
- public:
-  StalledListener() : fd_(socket(AF_INET, SOCK_STREAM, 0)), port_(bindLoopback(fd_)) {
-    listen(fd_, 0);
-    const sockaddr_in a = loopbackAddress(port_);
-    for (int& c : clients_) {
-      c = socket(AF_INET, SOCK_STREAM | SOCK_NONBLOCK, 0);
-      (void)connect(c, reinterpret_cast<const sockaddr*>(&a), sizeof a);
-    }
-  }
-  ~StalledListener() {
-    for (int c : clients_) close(c);
-    close(fd_);
-  }
-  int port() const { return port_; }
-
- private:
-  int fd_, port_;
-  int clients_[3];
-};
-
 // A TCP server on the loopback speaking for gpsd: it accepts one client at a
 // time (a new one replaces the last), ignores what the client sends, and
-// writes what the test says, with `greeting` right after each accept.
+// writes what the test says, with `greeting` right after each accept. A
+// stalled one never accepts and its queue is full: connecting to it hangs
+// until it closes.
 class FakeGpsd : public core::IPollSink {
  public:
-  explicit FakeGpsd(int port = 0)
+  explicit FakeGpsd(int port = 0, bool stalled = false)
       : dispatcher_(SharedPointer<core::LinAsyncCallDispatcher>::cast(loop())),
         listenFd_(socket(AF_INET, SOCK_STREAM | SOCK_NONBLOCK, 0)) {
     const int one = 1;
     setsockopt(listenFd_, SOL_SOCKET, SO_REUSEADDR, &one, sizeof one);
     port_ = bindLoopback(listenFd_, port);
-    listen(listenFd_, 4);
-    dispatcher_->attachPollSink({listenFd_, POLLIN, 0}, this);
+    listen(listenFd_, stalled ? 0 : 4);
+    if (!stalled) {
+      dispatcher_->attachPollSink({listenFd_, POLLIN, 0}, this);
+      return;
+    }
+    const sockaddr_in a = loopbackAddress(port_);
+    for (int& c : queued_) {
+      c = socket(AF_INET, SOCK_STREAM | SOCK_NONBLOCK, 0);
+      (void)connect(c, reinterpret_cast<const sockaddr*>(&a), sizeof a);
+    }
   }
   ~FakeGpsd() override {
     dropClient();
+    for (int c : queued_)
+      if (c >= 0) close(c);
     dispatcher_->detachPollSink({listenFd_, POLLIN, 0});
     close(listenFd_);
   }
@@ -157,6 +146,7 @@ class FakeGpsd : public core::IPollSink {
  private:
   SharedPointer<core::LinAsyncCallDispatcher> dispatcher_;
   int listenFd_, clientFd_ = -1, port_ = -1, accepted_ = 0;
+  int queued_[3] = {-1, -1, -1};  // a stalled one's
 };
 
 // A location manager made from the current LODESTACK_GNSS, keeping every
@@ -164,9 +154,9 @@ class FakeGpsd : public core::IPollSink {
 class StateLog {
  public:
   StateLog() {
-    created = location_manager_create(LOCATION_METHOD_GNSS, &manager);
-    if (created == LOCATION_ERROR_NONE)
-      registered = location_manager_set_service_state_changed_cb(manager, &changed, this);
+    EXPECT_EQ(location_manager_create(LOCATION_METHOD_GNSS, &manager), LOCATION_ERROR_NONE);
+    EXPECT_EQ(location_manager_set_service_state_changed_cb(manager, &changed, this),
+              LOCATION_ERROR_NONE);
   }
   ~StateLog() {
     if (manager) location_manager_destroy(manager);
@@ -190,7 +180,6 @@ class StateLog {
   bool last(location_service_state_e state) const { return !states.empty() && states.back() == state; }
 
   location_manager_h manager = nullptr;
-  int created = -1, registered = -1;
   std::vector<location_service_state_e> states;
   bool onTestThread = true;
 

@@ -185,29 +185,26 @@ INSTANTIATE_TEST_SUITE_P(Loops, ModemManagerFailures,
 
 // The choices of the environment, and a machine without a system bus.
 TEST(BusServiceChoices, UnknownChoicesAndAMissingBusAreRefused) {
-  setenv("LODESTACK_WLAN", "iwd", 1);
-  EXPECT_THROW(RadioMeasurements(), std::runtime_error);
-  EXPECT_EQ(platform::lastError(),
-            "LODESTACK_WLAN: expected scenario, wpa_supplicant, networkmanager or auto, got \"iwd\"");
-  EXPECT_FALSE(std::unique_ptr<radioadaptation::IRadioAdaptation>(
-      radioadaptation::RadioAdaptationFactory::createRadioAdaptation()));
-  unsetenv("LODESTACK_WLAN");
-  setenv("LODESTACK_CELLS", "ofono", 1);
-  EXPECT_THROW(RadioMeasurements(), std::runtime_error);
-  EXPECT_EQ(platform::lastError(), "LODESTACK_CELLS: expected scenario or modemmanager, got \"ofono\"");
-
-  setenv("LODESTACK_CELLS", "modemmanager", 1);
-  setenv("DBUS_SYSTEM_BUS_ADDRESS", "unix:path=/nonexistent/lodestack-test-bus", 1);
-  {
-    RadioMeasurements library;
-    EXPECT_THROW(library.startCellMeasurements([](void*, OxelMeasurements) {}, nullptr),
-                 std::runtime_error);
-    EXPECT_NE(platform::lastError().find(": no system bus at unix:path=/nonexistent/lodestack-test-bus: "),
-              std::string::npos)
-        << platform::lastError();
+  const std::pair<const char*, const char*> unknown[] = {
+      {"LODESTACK_WLAN",
+       "LODESTACK_WLAN: expected scenario, wpa_supplicant, networkmanager or auto, got \"bogus\""},
+      {"LODESTACK_CELLS", "LODESTACK_CELLS: expected scenario or modemmanager, got \"bogus\""}};
+  for (const auto& [variable, message] : unknown) {
+    EnvScope choice(variable, "bogus");
+    EXPECT_THROW(RadioMeasurements(), std::runtime_error);
+    EXPECT_EQ(platform::lastError(), message);
+    EXPECT_FALSE(std::unique_ptr<radioadaptation::IRadioAdaptation>(
+        radioadaptation::RadioAdaptationFactory::createRadioAdaptation()));
   }
-  unsetenv("DBUS_SYSTEM_BUS_ADDRESS");
-  unsetenv("LODESTACK_CELLS");
+
+  EnvScope cells("LODESTACK_CELLS", "modemmanager");
+  EnvScope noBus("DBUS_SYSTEM_BUS_ADDRESS", "unix:path=/nonexistent/lodestack-test-bus");
+  RadioMeasurements library;
+  EXPECT_THROW(library.startCellMeasurements([](void*, OxelMeasurements) {}, nullptr),
+               std::runtime_error);
+  EXPECT_NE(platform::lastError().find(": no system bus at unix:path=/nonexistent/lodestack-test-bus: "),
+            std::string::npos)
+      << platform::lastError();
 }
 
 }  // namespace
