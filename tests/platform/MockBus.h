@@ -40,7 +40,7 @@ class PrivateBus {
            "</busconfig>\n";
     daemon_.start({"/usr/bin/dbus-daemon", "--config-file=" + dir_.file("bus.conf"), "--nofork",
                    "--nopidfile"});
-    GError* e = nullptr;
+    GError* e = nullptr;  // why the last attempt to connect failed
     waitFor([&] {
       g_clear_error(&e);
       connection_ = g_dbus_connection_new_for_address_sync(
@@ -64,6 +64,7 @@ class PrivateBus {
       g_object_unref(connection_);
     }
   }
+
   // Empty when the bus runs; else why not.
   const std::string& error() const { return error_; }
 

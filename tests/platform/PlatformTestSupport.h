@@ -20,6 +20,7 @@
 namespace lodestack {
 namespace testing {
 
+// Sets an environment variable for one scope.
 class EnvScope {
  public:
   EnvScope(const char* name, const std::string& value) : name_(name) {
