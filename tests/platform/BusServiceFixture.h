@@ -4,7 +4,7 @@
 #ifndef LODESTACK_TESTS_PLATFORM_BUSSERVICEFIXTURE_H
 #define LODESTACK_TESTS_PLATFORM_BUSSERVICEFIXTURE_H
 
-#include <cstdlib>
+#include <optional>
 
 #include "platform/MockServices.h"
 #include "radioadaptation/TestPlatform.h"
@@ -15,15 +15,10 @@ namespace testing {
 class BusServiceFixture : public AdaptationFixture {
  protected:
   void SetUp() override { ASSERT_EQ(bus.error(), ""); }
-  void TearDown() override {
-    AdaptationFixture::TearDown();
-    unsetenv("LODESTACK_WLAN");
-    unsetenv("LODESTACK_CELLS");
-  }
   // The adaptation with WLAN and cells from these sources (null: the scenario).
   bool openWith(const char* wlan, const char* cells, int kinds) {
-    if (wlan) setenv("LODESTACK_WLAN", wlan, 1);
-    if (cells) setenv("LODESTACK_CELLS", cells, 1);
+    if (wlan) wlan_.emplace("LODESTACK_WLAN", wlan);
+    if (cells) cells_.emplace("LODESTACK_CELLS", cells);
     return open(kinds);
   }
   // Lets the sources' bus threads hear of names that came or went.
@@ -39,6 +34,9 @@ class BusServiceFixture : public AdaptationFixture {
   }
 
   PrivateBus bus;  // first: outlives the adaptation
+
+ private:
+  std::optional<EnvScope> wlan_, cells_;
 };
 
 }  // namespace testing

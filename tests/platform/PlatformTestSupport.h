@@ -13,6 +13,7 @@
 
 #include <chrono>
 #include <functional>
+#include <optional>
 #include <string>
 #include <thread>
 #include <vector>
@@ -24,12 +25,12 @@ namespace testing {
 class EnvScope {
  public:
   EnvScope(const char* name, const std::string& value) : name_(name) {
-    if (const char* old = getenv(name)) old_ = old, hadOld_ = true;
+    if (const char* old = getenv(name)) old_ = old;
     setenv(name, value.c_str(), 1);
   }
   ~EnvScope() {
-    if (hadOld_)
-      setenv(name_.c_str(), old_.c_str(), 1);
+    if (old_)
+      setenv(name_.c_str(), old_->c_str(), 1);
     else
       unsetenv(name_.c_str());
   }
@@ -38,8 +39,7 @@ class EnvScope {
 
  private:
   std::string name_;
-  std::string old_;
-  bool hadOld_ = false;
+  std::optional<std::string> old_;
 };
 
 // Calls `done` every 20 ms, without turning any loop, until it returns true
