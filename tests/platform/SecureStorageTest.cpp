@@ -20,15 +20,20 @@ using testing::EnvScope;
 using testing::readText;
 using testing::TemporaryDirectory;
 
-// The entry's value, or "" with the error in `result`.
-std::string get(const char* name, int* result = nullptr) {
+// ssa_get's result; the value handed out goes to `value` when given.
+int get(const char* name, std::string* value = nullptr) {
   char* data = nullptr;
   size_t length = 99;
   const int status = ssa_get(name, &data, &length);
-  if (result) *result = status;
   EXPECT_TRUE(status == 0 || (data == nullptr && length == 0)) << "a failed get hands out nothing";
-  const std::string value = data ? std::string(data, length) : std::string();
+  if (value) *value = data ? std::string(data, length) : std::string();
   free(data);
+  return status;
+}
+
+std::string valueOf(const char* name) {
+  std::string value;
+  get(name, &value);
   return value;
 }
 
@@ -43,22 +48,20 @@ TEST(SecureStorage, PrivateFilesReplacedWhole) {
   TemporaryDirectory dir;
   const std::string storage = dir.file("nested/storage");
   EnvScope chosen("LODESTACK_SECURE_STORAGE_DIR", storage);
-  int result = 0;
-  get("key", &result);
-  EXPECT_EQ(result, -ENOENT);
+  EXPECT_EQ(get("key"), -ENOENT);
 
   ASSERT_EQ(put("key", std::string("first\0value", 11)), 11);
   EXPECT_EQ(modeOf(storage), 0700u);
   EXPECT_EQ(modeOf(dir.file("nested")), 0700u);
   EXPECT_EQ(modeOf(storage + "/key"), 0600u);
-  EXPECT_EQ(get("key"), std::string("first\0value", 11));
+  EXPECT_EQ(valueOf("key"), std::string("first\0value", 11));
 
   struct stat before, after;
   ASSERT_EQ(stat((storage + "/key").c_str(), &before), 0);
   ASSERT_EQ(put("key", "second"), 6);
   ASSERT_EQ(stat((storage + "/key").c_str(), &after), 0);
   EXPECT_NE(before.st_ino, after.st_ino) << "replaced by a rename, not rewritten in place";
-  EXPECT_EQ(get("key"), "second");
+  EXPECT_EQ(valueOf("key"), "second");
   EXPECT_EQ(ssa_delete("key"), 0);
   EXPECT_EQ(ssa_delete("key"), -ENOENT);
   std::error_code ignored;
@@ -73,9 +76,7 @@ TEST(SecureStorage, BadNamesAndEntriesFailCleanly) {
   TemporaryDirectory dir;
   EnvScope chosen("LODESTACK_SECURE_STORAGE_DIR", dir.path());
   for (const char* name : {"", ".hidden", "a/b", "..", static_cast<const char*>(nullptr)}) {
-    int result = 0;
-    get(name, &result);
-    EXPECT_EQ(result, -EINVAL) << (name ? name : "null");
+    EXPECT_EQ(get(name), -EINVAL) << (name ? name : "null");
     EXPECT_EQ(put(name, "x"), -EINVAL);
     EXPECT_EQ(ssa_delete(name), -EINVAL);
   }
@@ -88,13 +89,9 @@ TEST(SecureStorage, BadNamesAndEntriesFailCleanly) {
   ASSERT_EQ(mkdir(dir.file("folder").c_str(), 0700), 0);
   ASSERT_EQ(symlink("big", dir.file("link").c_str()), 0);
   testing::writeText(dir.file("huge"), std::string(70000, 'h'));
-  int result = 0;
-  get("folder", &result);
-  EXPECT_LT(result, 0);
-  get("link", &result);
-  EXPECT_EQ(result, -ELOOP) << "links are not followed";
-  get("huge", &result);
-  EXPECT_EQ(result, -EFBIG);
+  EXPECT_LT(get("folder"), 0);
+  EXPECT_EQ(get("link"), -ELOOP) << "links are not followed";
+  EXPECT_EQ(get("huge"), -EFBIG);
   EXPECT_LT(put("folder", "x"), 0) << "a directory is not replaced";
 }
 
@@ -123,7 +120,7 @@ TEST(SecureStorage, ConcurrentReadersNeverSeeHalfAValue) {
   std::atomic<int> torn{0}, reads{0};
   std::thread reader([&] {
     for (; !done; ++reads) {
-      const std::string value = get("k");
+      const std::string value = valueOf("k");
       if (value != a && value != b) ++torn;
     }
   });
