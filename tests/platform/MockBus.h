@@ -77,10 +77,12 @@ class PrivateBus {
     GError* e = nullptr;
     GVariant* answer = nullptr;
     if (GVariant* parsed = g_variant_parse(G_VARIANT_TYPE(argsType.c_str()), args.c_str(),
-                                           nullptr, nullptr, &e))
+                                           nullptr, nullptr, &e)) {
       answer = g_dbus_connection_call_sync(connection_, name.c_str(), path.c_str(), iface.c_str(),
                                            method.c_str(), parsed, nullptr, G_DBUS_CALL_FLAGS_NONE,
                                            10000, nullptr, &e);
+      g_variant_unref(parsed);  // parsed values are not floating: the call keeps its own
+    }
     if (!answer) {
       const std::string failure = e->message;
       g_error_free(e);
