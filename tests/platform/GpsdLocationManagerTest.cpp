@@ -138,13 +138,23 @@ TEST(GpsdLocationManager, DisablesWhenFixesStopAndRecoversFromClosedOrOverflowin
   ASSERT_TRUE(runUntil([&] { return log.last(LOCATION_SERVICE_DISABLED); }, 1.0));
   ASSERT_TRUE(runUntil([&] { return log.last(LOCATION_SERVICE_ENABLED); }, 4.0));
   EXPECT_EQ(gpsd.accepted(), 3);
+
+  // A reset is never handed over by the loop, yet it is noticed long before
+  // the fix would time out, and without spinning until then.
+  const std::clock_t cpuBefore = std::clock();
+  gpsd.resetClient();
+  ASSERT_TRUE(runUntil([&] { return log.last(LOCATION_SERVICE_DISABLED); }, 1.0))
+      << "a reset connection disables at once";
+  EXPECT_LT(static_cast<double>(std::clock() - cpuBefore) / CLOCKS_PER_SEC, 0.5);
+  ASSERT_TRUE(runUntil([&] { return log.last(LOCATION_SERVICE_ENABLED); }, 4.0));
+  EXPECT_EQ(gpsd.accepted(), 4);
   // The first report is disabled or, when the first fix came sooner, enabled.
   const std::vector<location_service_state_e> after(
       std::find(log.states.begin(), log.states.end(), LOCATION_SERVICE_ENABLED), log.states.end());
   EXPECT_EQ(after, (std::vector<location_service_state_e>{
                        LOCATION_SERVICE_ENABLED, LOCATION_SERVICE_DISABLED, LOCATION_SERVICE_ENABLED,
                        LOCATION_SERVICE_DISABLED, LOCATION_SERVICE_ENABLED, LOCATION_SERVICE_DISABLED,
-                       LOCATION_SERVICE_ENABLED}));
+                       LOCATION_SERVICE_ENABLED, LOCATION_SERVICE_DISABLED, LOCATION_SERVICE_ENABLED}));
   EXPECT_TRUE(log.onTestThread);
 }
 

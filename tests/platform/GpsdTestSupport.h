@@ -134,6 +134,15 @@ class FakeGpsd : public core::IPollSink {
     clientFd_ = -1;
   }
 
+  // Ends the connection with a reset, as a gpsd that dies does.
+  void resetClient() {
+    if (clientFd_ < 0) return;
+    const linger abort{1, 0};
+    setsockopt(clientFd_, SOL_SOCKET, SO_LINGER, &abort, sizeof abort);
+    close(clientFd_);
+    clientFd_ = -1;
+  }
+
   void handlePollEvent(const pollfd&) override {
     const int fd = accept(listenFd_, nullptr, nullptr);
     if (fd < 0) return;

@@ -4,6 +4,9 @@
 // disabled when a report drops below 2D, when no fix has come for
 // kFixTimeoutMs, or when the connection to gpsd closes or cannot be made;
 // while gpsd is away a new connection is tried every kReconnectMs.
+// The loop never hands over input that comes with an error or hang-up (a
+// connection gpsd reset), and such a descriptor keeps the loop awake, so
+// while connected the socket is also looked at every kLivenessCheckMs.
 //
 // Resolving the host and connecting may block for long (a name server that
 // does not answer, a host that drops packets), so each attempt runs on a
@@ -47,6 +50,7 @@ using gom::SharedPointer;
 
 const long long kFixTimeoutMs = 3000;
 const long long kReconnectMs = 2000;
+const long long kLivenessCheckMs = 200;
 // Handed over when gpsd gives no horizontal error estimate: deliberately
 // pessimistic, so that such a fix weighs little.
 const double kUnknownAccuracyM = 100.0;
@@ -132,7 +136,8 @@ class GpsdLocationSource : public LocationSource,
       : host_(std::move(host)), port_(std::move(port)) {}
 
   ~GpsdLocationSource() override {
-    for (ITimer* t : {reportTimer_.get(), reconnectTimer_.get(), fixTimer_.get()})
+    for (ITimer* t : {reportTimer_.get(), reconnectTimer_.get(), fixTimer_.get(),
+                      livenessTimer_.get()})
       if (t) t->stop();
     closeConnection();
   }
@@ -144,7 +149,8 @@ class GpsdLocationSource : public LocationSource,
     reportTimer_ = SharedPointer<ITimer>(ITimer::create(this));
     reconnectTimer_ = SharedPointer<ITimer>(ITimer::create(this));
     fixTimer_ = SharedPointer<ITimer>(ITimer::create(this));
-    if (!dispatcher_ || !reportTimer_ || !reconnectTimer_ || !fixTimer_) {
+    livenessTimer_ = SharedPointer<ITimer>(ITimer::create(this));
+    if (!dispatcher_ || !reportTimer_ || !reconnectTimer_ || !fixTimer_ || !livenessTimer_) {
       setLastError("location manager: no Linux dispatcher with timers on this thread");
       return false;
     }
@@ -173,6 +179,8 @@ class GpsdLocationSource : public LocationSource,
       connect();
     } else if (timer == fixTimer_.get()) {
       loseFix();
+    } else if (timer == livenessTimer_.get()) {
+      checkConnection();
     }
   }
 
@@ -221,6 +229,17 @@ class GpsdLocationSource : public LocationSource,
     }
     connection_ = std::move(c);
     complained_ = false;
+    livenessTimer_->start(kLivenessCheckMs, kLivenessCheckMs, 0);
+  }
+
+  // A reset connection: what came before the end still counts, then the
+  // connection ends as a closed one does.
+  void checkConnection() {
+    if (!connection_ || opening_) return;
+    pollfd p{connection_->data.gps_fd, POLLIN, 0};
+    if (poll(&p, 1, 0) != 1 || !(p.revents & (POLLERR | POLLHUP))) return;
+    readMessages();
+    if (connection_ && !opening_) failed("connection reset");
   }
 
   // Reads the complete messages gpsd has sent; a closed connection, a read
@@ -281,6 +300,7 @@ class GpsdLocationSource : public LocationSource,
       opening_ = false;
     } else {
       dispatcher_->detachPollSink({connection_->data.gps_fd, POLLIN, 0});
+      livenessTimer_->stop();
     }
     connection_.reset();
   }
@@ -297,6 +317,7 @@ class GpsdLocationSource : public LocationSource,
   SharedPointer<ITimer> reportTimer_;     // the first report, from the loop
   SharedPointer<ITimer> reconnectTimer_;  // armed while gpsd is away
   SharedPointer<ITimer> fixTimer_;        // armed while a fix is current
+  SharedPointer<ITimer> livenessTimer_;   // armed while connected
   std::shared_ptr<Connection> connection_;
   std::thread opener_;
   bool opening_ = false;     // opener_ runs for connection_
